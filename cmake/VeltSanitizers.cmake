@@ -1,0 +1,10 @@
+# Applies the chosen sanitizer set to everything built from here on.
+if(VELT_SANITIZE STREQUAL "address")
+  add_compile_options(-fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  add_link_options(-fsanitize=address,undefined)
+elseif(VELT_SANITIZE STREQUAL "thread")
+  add_compile_options(-fsanitize=thread -fno-omit-frame-pointer)
+  add_link_options(-fsanitize=thread)
+elseif(NOT VELT_SANITIZE STREQUAL "")
+  message(FATAL_ERROR "VELT_SANITIZE must be empty, address or thread, not '${VELT_SANITIZE}'")
+endif()

@@ -1,0 +1,19 @@
+#pragma once
+
+#include "IInterface.h"
+
+// The host's diagnostics service ("IDiag"). This driver binds and releases it
+// and reads nothing but its identity.
+class IDiag : public IInterface {
+ public:
+  virtual const char* GetImpName() const = 0;
+  virtual int GetImpVersion() const = 0;
+
+ protected:
+  IDiag() = default;
+  IDiag(const IDiag&) = default;
+  IDiag& operator=(const IDiag&) = default;
+  IDiag(IDiag&&) = default;
+  IDiag& operator=(IDiag&&) = default;
+  ~IDiag() = default;
+};

@@ -1,0 +1,47 @@
+#pragma once
+
+#include "IInterface.h"
+
+// The host's permanent storage ("IPermanentStorage"): typed values by section
+// and name that survive a restart.
+class IPermanentStorage : public IInterface {
+ public:
+  // This object for the interface names it answers ("IPermanentStorage",
+  // and "IPermanentStorage2" where offered), else null.
+  virtual IInterface* ConvertTo(const char* name) = 0;
+  virtual void SetStringValue(const char* section, const char* name, const char* value) = 0;
+  virtual void SetBoolValue(const char* section, const char* name, bool value) = 0;
+  virtual void SetIntValue(const char* section, const char* name, int value) = 0;
+  // The stored text; valid until the calling thread's next call on this
+  // storage.
+  virtual const char* GetStringValue(const char* section, const char* name) = 0;
+  virtual bool GetBoolValue(const char* section, const char* name) = 0;
+  virtual int GetIntValue(const char* section, const char* name) = 0;
+  // Non-zero when a value is stored under section and name.
+  virtual int HasValue(const char* section, const char* name) = 0;
+
+ protected:
+  IPermanentStorage() = default;
+  IPermanentStorage(const IPermanentStorage&) = default;
+  IPermanentStorage& operator=(const IPermanentStorage&) = default;
+  IPermanentStorage(IPermanentStorage&&) = default;
+  IPermanentStorage& operator=(IPermanentStorage&&) = default;
+  ~IPermanentStorage() = default;
+};
+
+// Second generation ("IPermanentStorage2"): strings read into the caller's
+// buffer.
+class IPermanentStorage2 : public IPermanentStorage {
+ public:
+  // Copies the stored text, terminated, into buffer (at most size bytes).
+  // Non-zero on success; zero when the name is absent or does not fit.
+  virtual int GetStringValueInto(const char* section, const char* name, char* buffer, int size) = 0;
+
+ protected:
+  IPermanentStorage2() = default;
+  IPermanentStorage2(const IPermanentStorage2&) = default;
+  IPermanentStorage2& operator=(const IPermanentStorage2&) = default;
+  IPermanentStorage2(IPermanentStorage2&&) = default;
+  IPermanentStorage2& operator=(IPermanentStorage2&&) = default;
+  ~IPermanentStorage2() = default;
+};

@@ -1,0 +1,33 @@
+#pragma once
+
+// The body of a host task: the host's task calls Task() once on its own
+// thread. Slots: two destructor slots, Task.
+class ITaskRunner {
+ public:
+  virtual ~ITaskRunner() = default;
+  virtual void Task() = 0;
+
+ protected:
+  ITaskRunner() = default;
+  ITaskRunner(const ITaskRunner&) = default;
+  ITaskRunner& operator=(const ITaskRunner&) = default;
+  ITaskRunner(ITaskRunner&&) = default;
+  ITaskRunner& operator=(ITaskRunner&&) = default;
+};
+
+namespace MultiTaskN {
+
+// Convenience base that task runners derive from.
+class TaskRunner : public ITaskRunner {
+ public:
+  ~TaskRunner() override = default;
+
+ protected:
+  TaskRunner() = default;
+  TaskRunner(const TaskRunner&) = default;
+  TaskRunner& operator=(const TaskRunner&) = default;
+  TaskRunner(TaskRunner&&) = default;
+  TaskRunner& operator=(TaskRunner&&) = default;
+};
+
+}  // namespace MultiTaskN

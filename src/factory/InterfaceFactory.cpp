@@ -1,0 +1,17 @@
+#include "factory/InterfaceFactory.h"
+
+#include "factory/CompareInterface.h"
+#include "factory/ModuleFactory.h"
+
+IInterface* InterfaceFactory::CreateInterface(const char* name) {
+  if (CompareInterface(name, "IProtocolFactory") != 0 ||
+      CompareInterface(name, "ProtocolFactory") != 0) {
+    return &Factory.protocolFactory;
+  }
+  if (CompareInterface(name, "IProtModule") != 0 || CompareInterface(name, "ProtModule") != 0) {
+    return &Factory.protModule;
+  }
+  return nullptr;
+}
+
+void InterfaceFactory::ReleaseInterface(IInterface* /*itf*/) {}

@@ -1,0 +1,14 @@
+#pragma once
+
+#include "IInterfaceFactory.h"
+
+// The interface factory that GetInterfaceFactory returns. It hands out the
+// static parts of the module-wide Factory by name and creates nothing.
+class InterfaceFactory final : public IInterfaceFactory {
+ public:
+  // "IProtocolFactory"/"ProtocolFactory": the protocol factory;
+  // "IProtModule"/"ProtModule": the module; anything else: null.
+  IInterface* CreateInterface(const char* name) override;
+  // Nothing to give back: the interfaces are parts of a static object.
+  void ReleaseInterface(IInterface* itf) override;
+};

@@ -1,0 +1,19 @@
+#pragma once
+
+#include "factory/InterfaceFactory.h"
+#include "factory/ProtModule.h"
+#include "factory/ProtocolFactory.h"
+
+// The library's one module-wide object, in this order: the interface factory
+// that GetInterfaceFactory hands out, the protocol factory and the module.
+// It is built by the library's static initialiser when the library is loaded
+// and torn down when it is unloaded; tearing down the module part gives back
+// any host services still bound.
+struct ModuleFactory {
+  InterfaceFactory interfaceFactory;
+  ProtocolFactory protocolFactory;
+  ProtModule protModule;
+};
+
+// NOLINTNEXTLINE(cppcoreguidelines-avoid-non-const-global-variables)
+extern ModuleFactory Factory;
