@@ -1,0 +1,14 @@
+#include "driver/TaskRunner_VELT.h"
+
+#include "driver/Protocol_VELT.h"
+
+void TaskRunner_VELT::Task() {
+  for (;;) {
+    ITask* const task = workerTask.load();
+    if (task == nullptr || task->IsStopping() != 0) {
+      return;
+    }
+    protocol->Task();
+    multiTask->Sleep(0);
+  }
+}

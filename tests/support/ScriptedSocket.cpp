@@ -1,0 +1,138 @@
+#include "ScriptedSocket.h"
+
+#include <algorithm>
+#include <cstring>
+
+int ScriptedSocket::Connect(const char* ip, unsigned short port) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  connects_.push_back({ip == nullptr ? std::string() : std::string(ip), port});
+  if (connectResults_.empty()) {
+    return 0;
+  }
+  const int result = connectResults_.front();
+  connectResults_.pop_front();
+  return result;
+}
+
+int ScriptedSocket::IsBroken() {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return broken_ ? 1 : 0;
+}
+
+int ScriptedSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMilliseconds) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  receives_.push_back({maxLength, timeoutMilliseconds});
+  if (script_.empty() || maxLength < 1) {
+    return 0;
+  }
+  Step& step = script_.front();
+  switch (step.kind) {
+    case Step::Timeout:
+      script_.pop_front();
+      return 0;
+    case Step::Error:
+      script_.pop_front();
+      return -1;
+    case Step::Datagram: {
+      const std::size_t n = std::min(step.bytes.size(), static_cast<std::size_t>(maxLength));
+      std::memcpy(buffer, step.bytes.data(), n);
+      script_.pop_front();
+      return static_cast<int>(n);
+    }
+    case Step::Stream: {
+      const std::size_t n = std::min(step.bytes.size(), static_cast<std::size_t>(maxLength));
+      std::memcpy(buffer, step.bytes.data(), n);
+      step.bytes.erase(0, n);
+      if (step.bytes.empty()) {
+        script_.pop_front();
+      }
+      return static_cast<int>(n);
+    }
+  }
+  return -1;
+}
+
+int ScriptedSocket::GetAdapterInfo(unsigned int ip, unsigned int* address, unsigned int* mask,
+                                   unsigned int* index) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  adapterQueries_.push_back(ip);
+  if (!hasAdapter_) {
+    return 0;
+  }
+  *address = adapterAddress_;
+  *mask = adapterMask_;
+  *index = 1;
+  return 1;
+}
+
+int ScriptedSocket::Send(const unsigned char* data, int length) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  sends_.emplace_back(reinterpret_cast<const char*>(data), static_cast<std::size_t>(length));
+  return length;
+}
+
+void ScriptedSocket::AddDatagram(const std::string& bytes) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  script_.push_back({Step::Datagram, bytes});
+}
+
+void ScriptedSocket::AddStream(const std::string& bytes) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  if (!bytes.empty()) {
+    script_.push_back({Step::Stream, bytes});
+  }
+}
+
+void ScriptedSocket::AddTimeout() {
+  const std::lock_guard<std::mutex> guard(lock_);
+  script_.push_back({Step::Timeout, {}});
+}
+
+void ScriptedSocket::AddError() {
+  const std::lock_guard<std::mutex> guard(lock_);
+  script_.push_back({Step::Error, {}});
+}
+
+void ScriptedSocket::AddConnectResults(int result, int count) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  for (int i = 0; i < count; ++i) {
+    connectResults_.push_back(result);
+  }
+}
+
+void ScriptedSocket::SetBroken(bool broken) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  broken_ = broken;
+}
+
+void ScriptedSocket::SetAdapter(unsigned int address, unsigned int mask) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  hasAdapter_ = true;
+  adapterAddress_ = address;
+  adapterMask_ = mask;
+}
+
+std::size_t ScriptedSocket::Pending() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return script_.size();
+}
+
+std::vector<ScriptedSocket::ConnectCall> ScriptedSocket::Connects() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return connects_;
+}
+
+std::vector<std::string> ScriptedSocket::Sends() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return sends_;
+}
+
+std::vector<ScriptedSocket::ReceiveCall> ScriptedSocket::Receives() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return receives_;
+}
+
+std::vector<unsigned int> ScriptedSocket::AdapterQueries() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return adapterQueries_;
+}

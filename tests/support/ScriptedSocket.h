@@ -1,0 +1,75 @@
+#pragma once
+
+#include <deque>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "ISocket.h"
+
+// A socket that plays a script. Receive consumes the script from the front:
+// a datagram step is delivered whole by one call (cut to the caller's maximum),
+// a stream step is handed out up to the caller's maximum per call, a time-out
+// step answers 0 once and an error step -1 once; an empty script answers 0.
+// Connect answers the queued results (0 once the queue is empty); IsBroken
+// answers the broken flag. Every call is recorded.
+class ScriptedSocket final : public ISocket {
+ public:
+  struct ConnectCall {
+    std::string ip;
+    unsigned short port;
+  };
+  struct ReceiveCall {
+    int maxLength;
+    int timeout;
+  };
+
+  ScriptedSocket(unsigned short localPort, int tcp) : localPort_(localPort), tcp_(tcp) {}
+
+  int Connect(const char* ip, unsigned short port) override;
+  int IsBroken() override;
+  int Receive(unsigned char* buffer, int maxLength, int timeoutMilliseconds) override;
+  int GetAdapterInfo(unsigned int ip, unsigned int* address, unsigned int* mask,
+                     unsigned int* index) override;
+  int Send(const unsigned char* data, int length) override;
+
+  // Script.
+  void AddDatagram(const std::string& bytes);
+  void AddStream(const std::string& bytes);
+  void AddTimeout();
+  void AddError();
+  void AddConnectResults(int result, int count = 1);
+  void SetBroken(bool broken);
+  // The adapter the look-up answers for any address; failing when not set.
+  void SetAdapter(unsigned int address, unsigned int mask);
+  // How many script steps are left.
+  std::size_t Pending() const;
+
+  // Records.
+  unsigned short LocalPort() const { return localPort_; }
+  int Tcp() const { return tcp_; }
+  std::vector<ConnectCall> Connects() const;
+  std::vector<std::string> Sends() const;
+  std::vector<ReceiveCall> Receives() const;
+  std::vector<unsigned int> AdapterQueries() const;
+
+ private:
+  struct Step {
+    enum Kind { Datagram, Stream, Timeout, Error } kind;
+    std::string bytes;
+  };
+
+  mutable std::mutex lock_;
+  unsigned short localPort_;
+  int tcp_;
+  std::deque<Step> script_;
+  std::deque<int> connectResults_;
+  bool broken_ = false;
+  bool hasAdapter_ = false;
+  unsigned int adapterAddress_ = 0;
+  unsigned int adapterMask_ = 0;
+  std::vector<ConnectCall> connects_;
+  std::vector<std::string> sends_;
+  std::vector<ReceiveCall> receives_;
+  std::vector<unsigned int> adapterQueries_;
+};
