@@ -165,16 +165,21 @@ ParameterReplacer::Variant ParameterReplacer::readStored(const std::string& full
 std::string ParameterReplacer::readStoredText(const std::string& fullName) const {
   IInterface* const second = piPermanentStorage->ConvertTo("IPermanentStorage2");
   if (second != nullptr) {
+    // The storage answered the name "IPermanentStorage2", so it is one.
+    // NOLINTNEXTLINE(cppcoreguidelines-pro-type-static-cast-downcast)
+    auto* const storage2 = static_cast<IPermanentStorage2*>(second);
     std::array<char, kTextBufferSize> buffer{};
-    const int read = static_cast<IPermanentStorage2*>(second)->GetStringValueInto(
-        section.c_str(), fullName.c_str(), buffer.data(), kTextBufferSize);
-    if (read == 0) {
-      return std::string();
+    if (storage2->GetStringValueInto(section.c_str(), fullName.c_str(), buffer.data(),
+                                     kTextBufferSize) == 0) {
+      return {};
     }
     // A host that fills the whole buffer without a terminator still cannot
     // make the copy run past it.
     return std::string(buffer.begin(), std::find(buffer.begin(), buffer.end(), '\0'));
   }
   const char* const text = piPermanentStorage->GetStringValue(section.c_str(), fullName.c_str());
-  return text == nullptr ? std::string() : std::string(text);
+  if (text == nullptr) {
+    return {};
+  }
+  return text;
 }
