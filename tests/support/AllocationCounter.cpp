@@ -28,7 +28,7 @@ void* Allocate(std::size_t size) {
 void* AllocateAligned(std::size_t size, std::align_val_t alignment) {
   ++threadAllocations;
   const std::size_t bytes = size == 0 ? 1 : size;
-  std::size_t align = static_cast<std::size_t>(alignment);
+  auto align = static_cast<std::size_t>(alignment);
   align = align < sizeof(void*) ? sizeof(void*) : align;
   for (;;) {
     void* memory = nullptr;

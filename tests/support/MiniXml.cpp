@@ -423,9 +423,9 @@ std::string MiniXml::readReference() {
       if (IsDigit(c)) {
         digit = static_cast<unsigned long>(c - '0');
       } else if (hex && c >= 'a' && c <= 'f') {
-        digit = static_cast<unsigned long>(c - 'a' + 10);
+        digit = static_cast<unsigned long>(c - 'a') + 10;
       } else if (hex && c >= 'A' && c <= 'F') {
-        digit = static_cast<unsigned long>(c - 'A' + 10);
+        digit = static_cast<unsigned long>(c - 'A') + 10;
       } else {
         failAt(start, "malformed character reference");
       }

@@ -6,8 +6,8 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
 #include <stdexcept>
+#include <system_error>
 #include <vector>
 
 namespace {
@@ -82,5 +82,6 @@ void AtomicFile::Write(const std::string& path, const std::string& content) {
 }
 
 void AtomicFile::fail(const char* step, int error) const {
-  throw std::runtime_error("cannot write '" + target + "': " + step + ": " + std::strerror(error));
+  throw std::runtime_error("cannot write '" + target + "': " + step + ": " +
+                           std::generic_category().message(error));
 }

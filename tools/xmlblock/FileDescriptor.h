@@ -10,8 +10,8 @@ class FileDescriptor {
   FileDescriptor& operator=(FileDescriptor&&) = delete;
   ~FileDescriptor();
 
-  int get() const noexcept { return fd; }
-  bool valid() const noexcept { return fd >= 0; }
+  [[nodiscard]] int get() const noexcept { return fd; }
+  [[nodiscard]] bool valid() const noexcept { return fd >= 0; }
   // Closes now and returns 0 or the errno of close: on some file systems a
   // failed write only shows up here, so a writer must not ignore it.
   int close() noexcept;

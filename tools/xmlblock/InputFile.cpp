@@ -3,16 +3,17 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <array>
 #include <cerrno>
-#include <cstring>
 #include <stdexcept>
+#include <system_error>
 
 #include "xmlblock/FileDescriptor.h"
 
 namespace {
 
 [[noreturn]] void Fail(const std::string& path, int error) {
-  throw std::runtime_error("cannot read '" + path + "': " + std::strerror(error));
+  throw std::runtime_error("cannot read '" + path + "': " + std::generic_category().message(error));
 }
 
 }  // namespace
@@ -23,9 +24,9 @@ std::string InputFile::Read(const std::string& path) {
     Fail(path, errno);
   }
   std::string content;
-  char chunk[65536];
+  std::array<char, 65536> chunk{};
   for (;;) {
-    const ssize_t got = ::read(file.get(), chunk, sizeof chunk);
+    const ssize_t got = ::read(file.get(), chunk.data(), chunk.size());
     if (got < 0) {
       if (errno == EINTR) {
         continue;
@@ -35,7 +36,7 @@ std::string InputFile::Read(const std::string& path) {
     if (got == 0) {
       break;
     }
-    content.append(chunk, static_cast<std::size_t>(got));
+    content.append(chunk.data(), static_cast<std::size_t>(got));
   }
   return content;
 }

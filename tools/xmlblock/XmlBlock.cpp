@@ -2,9 +2,10 @@
 
 #include <zlib.h>
 
-#include <cstdio>
 #include <limits>
 #include <stdexcept>
+
+#include "xmlblock/HexByte.h"
 
 XmlBlock::XmlBlock(const std::string& document) {
   if (document.empty()) {
@@ -16,7 +17,6 @@ XmlBlock::XmlBlock(const std::string& document) {
   header = block.size();
   appendText(kLengthKey + std::to_string(compressed.size()));
   block.insert(block.end(), compressed.begin(), compressed.end());
-  stream = compressed.size();
   appendText(kTrailer);
 }
 
@@ -41,11 +41,11 @@ void XmlBlock::Verify(const std::vector<unsigned char>& compressed, const std::s
   // 78 9C is the zlib header of a 32 KiB window at the default level; the
   // host's reader relies on it.
   if (compressed.size() < 2 || compressed[0] != 0x78 || compressed[1] != 0x9C) {
-    char found[32];
-    std::snprintf(found, sizeof found, "%02X %02X", compressed.empty() ? 0U : compressed[0],
-                  compressed.size() < 2 ? 0U : compressed[1]);
-    throw std::runtime_error(std::string("the zlib stream begins with ") + found +
-                             " instead of 78 9C");
+    std::string found;
+    for (std::size_t i = 0; i < compressed.size() && i < 2; ++i) {
+      found += HexByte(compressed[i]) + " ";
+    }
+    throw std::runtime_error("the zlib stream begins with " + found + "instead of 78 9c");
   }
   std::string inflated(document.size(), '\0');
   auto inflatedLength = static_cast<uLongf>(inflated.size());

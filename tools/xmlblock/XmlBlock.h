@@ -22,11 +22,10 @@ class XmlBlock {
   // does not inflate back to exactly the document.
   explicit XmlBlock(const std::string& document);
 
-  const std::vector<unsigned char>& bytes() const { return block; }
+  [[nodiscard]] const std::vector<unsigned char>& bytes() const { return block; }
   // Bytes up to and including the header's zero byte; the host is handed a
   // pointer this far into the block, at the length line.
-  std::size_t headerSize() const { return header; }
-  std::size_t streamSize() const { return stream; }
+  [[nodiscard]] std::size_t headerSize() const { return header; }
 
  private:
   static std::vector<unsigned char> Compress(const std::string& document);
@@ -35,5 +34,4 @@ class XmlBlock {
 
   std::vector<unsigned char> block;
   std::size_t header = 0;
-  std::size_t stream = 0;
 };
