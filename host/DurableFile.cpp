@@ -5,7 +5,7 @@
 #include <unistd.h>
 
 #include <cerrno>
-#include <cstring>
+#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -14,7 +14,7 @@
 namespace {
 
 std::string Failure(const std::string& path, const char* what, int error) {
-  return path + ": " + what + ": " + std::strerror(error);
+  return path + ": " + what + ": " + std::generic_category().message(error);
 }
 
 std::string FolderOf(const std::string& path) {
@@ -79,7 +79,7 @@ DurableFile::ReadResult DurableFile::Read(const std::string& path, std::string& 
     if (errno == ENOENT) {
       return ReadResult::Missing;
     }
-    error = std::string("cannot open: ") + std::strerror(errno);
+    error = std::string("cannot open: ") + std::generic_category().message(errno);
     return ReadResult::Failed;
   }
   contents.clear();
@@ -93,7 +93,7 @@ DurableFile::ReadResult DurableFile::Read(const std::string& path, std::string& 
       if (errno == EINTR) {
         continue;
       }
-      error = std::string("cannot read: ") + std::strerror(errno);
+      error = std::string("cannot read: ") + std::generic_category().message(errno);
       return ReadResult::Failed;
     }
     contents.append(chunk.data(), static_cast<std::size_t>(n));

@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <system_error>
 #include <utility>
 
 #include "AdapterLookup.h"
@@ -21,7 +22,7 @@ namespace {
 constexpr std::size_t kReceiveBufferSize = 4096;
 
 std::string SystemError(const char* what, int error) {
-  return std::string(what) + ": " + std::strerror(error);
+  return std::string(what) + ": " + std::generic_category().message(error);
 }
 
 bool SetOption(int fd, int level, int option) {

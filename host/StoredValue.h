@@ -12,8 +12,8 @@ class StoredValue {
   enum class Type { Text, Boolean, Integer };
 
   static StoredValue OfText(std::string text);
-  static StoredValue OfBoolean(bool value);
-  static StoredValue OfInteger(std::int32_t value);
+  static StoredValue OfBoolean(bool flag);
+  static StoredValue OfInteger(std::int32_t number);
 
   Type GetType() const { return type_; }
   // Text as is; booleans as "true" or "false"; integers in decimal.
