@@ -1,0 +1,5 @@
+#include "HostMutex.h"
+
+void HostMutex::Lock() { mutex_.lock(); }
+
+void HostMutex::Unlock() { mutex_.unlock(); }

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <mutex>
+
+#include "IMultiTask2.h"
+
+// A plain, non-recursive mutex handed to the plug-in. Locking it twice on one
+// thread, or unlocking it on a thread that does not hold it, is a caller
+// error, as for any plain mutex.
+class HostMutex final : public IMutex {
+ public:
+  HostMutex() = default;
+  HostMutex(const HostMutex&) = delete;
+  HostMutex& operator=(const HostMutex&) = delete;
+  HostMutex(HostMutex&&) = delete;
+  HostMutex& operator=(HostMutex&&) = delete;
+  ~HostMutex() = default;
+
+  void Lock() override;
+  void Unlock() override;
+
+ private:
+  std::mutex mutex_;
+};

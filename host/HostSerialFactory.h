@@ -1,0 +1,14 @@
+#pragma once
+
+#include "ISerialFactory.h"
+
+// The serial-port service ("ISerialFactory"). This host has no serial
+// ports to offer; the plug-in binds the service and shows its identity in
+// its information text.
+class HostSerialFactory final : public ISerialFactory {
+ public:
+  // "HostSerialFactory".
+  const char* GetImpName() const override;
+  // 100.
+  int GetImpVersion() const override;
+};

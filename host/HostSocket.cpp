@@ -1,0 +1,357 @@
+#include "HostSocket.h"
+
+#include <arpa/inet.h>
+#include <netinet/tcp.h>
+#include <poll.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <system_error>
+#include <utility>
+
+#include "AdapterLookup.h"
+#include "HostTask.h"
+
+namespace {
+
+// One recv takes up to this much of a TCP stream; the driver then reads it a
+// byte at a time from memory.
+constexpr std::size_t kReceiveBufferSize = 4096;
+
+std::string SystemError(const char* what, int error) {
+  return std::string(what) + ": " + std::generic_category().message(error);
+}
+
+bool SetOption(int fd, int level, int option) {
+  const int on = 1;
+  return ::setsockopt(fd, level, option, &on, sizeof on) == 0;
+}
+
+bool WouldBlock(int error) { return error == EAGAIN || error == EWOULDBLOCK; }
+
+}  // namespace
+
+std::unique_ptr<HostSocket> HostSocket::Create(bool tcp, unsigned short localPort,
+                                               Timeouts timeouts, std::string& error) {
+  FileDescriptor fd = Open(tcp, error);
+  if (!fd.Valid() || !Bind(fd.Get(), localPort, error)) {
+    return nullptr;
+  }
+  return std::unique_ptr<HostSocket>(new HostSocket(std::move(fd), tcp, localPort, timeouts));
+}
+
+HostSocket::HostSocket(FileDescriptor fd, bool tcp, unsigned short configuredPort,
+                       Timeouts timeouts)
+    : fd_(std::move(fd)),
+      tcp_(tcp),
+      configuredPort_(configuredPort),
+      timeouts_(timeouts),
+      rxBuffer_(tcp ? kReceiveBufferSize : 0) {
+  RecordLocalPort();
+}
+
+FileDescriptor HostSocket::Open(bool tcp, std::string& error) {
+  const int type = (tcp ? SOCK_STREAM : SOCK_DGRAM) | SOCK_NONBLOCK | SOCK_CLOEXEC;
+  FileDescriptor fd(::socket(AF_INET, type, 0));
+  if (!fd.Valid()) {
+    error = SystemError("socket", errno);
+    return fd;
+  }
+  // Reuse lets a re-created socket bind its port again at once; broadcast
+  // lets a UDP channel send to 255.255.255.255 and subnet broadcasts; no
+  // delay keeps small token frames from waiting for more data.
+  bool ok = SetOption(fd.Get(), SOL_SOCKET, SO_REUSEADDR);
+  ok = ok && (tcp ? SetOption(fd.Get(), IPPROTO_TCP, TCP_NODELAY)
+                  : SetOption(fd.Get(), SOL_SOCKET, SO_BROADCAST));
+  if (!ok) {
+    error = SystemError("setsockopt", errno);
+    return FileDescriptor();
+  }
+  return fd;
+}
+
+bool HostSocket::Bind(int fd, unsigned short port, std::string& error) {
+  sockaddr_in local{};
+  local.sin_family = AF_INET;
+  local.sin_addr.s_addr = htonl(INADDR_ANY);
+  local.sin_port = htons(port);
+  if (::bind(fd, reinterpret_cast<const sockaddr*>(&local), sizeof local) != 0) {
+    error = SystemError(("bind to port " + std::to_string(port)).c_str(), errno);
+    return false;
+  }
+  return true;
+}
+
+bool HostSocket::ParseAddress(const char* ip, unsigned short port, sockaddr_in& address) {
+  address = sockaddr_in{};
+  address.sin_family = AF_INET;
+  address.sin_port = htons(port);
+  return ip != nullptr && ::inet_pton(AF_INET, ip, &address.sin_addr) == 1;
+}
+
+HostSocket::WaitResult HostSocket::WaitFor(int fd, short events, Clock::time_point deadline) {
+  const int stopFd = HostTask::CurrentStopDescriptor();
+  pollfd fds[2] = {{fd, events, 0}, {stopFd, POLLIN, 0}};
+  const nfds_t count = stopFd >= 0 ? 2 : 1;
+  for (;;) {
+    const auto left = std::chrono::ceil<std::chrono::milliseconds>(deadline - Clock::now());
+    const int timeout = static_cast<int>(std::max<std::chrono::milliseconds::rep>(left.count(), 0));
+    const int rc = ::poll(fds, count, timeout);
+    if (rc < 0) {
+      if (errno == EINTR) {
+        continue;
+      }
+      return WaitResult::Failed;
+    }
+    // A stop wins over data: the task is ending and must not be held up.
+    if (count == 2 && fds[1].revents != 0) {
+      return WaitResult::Stopped;
+    }
+    if (fds[0].revents != 0) {
+      return WaitResult::Ready;
+    }
+    if (timeout == 0) {
+      return WaitResult::TimedOut;
+    }
+  }
+}
+
+void HostSocket::RecordLocalPort() {
+  sockaddr_in local{};
+  socklen_t length = sizeof local;
+  if (::getsockname(fd_.Get(), reinterpret_cast<sockaddr*>(&local), &length) == 0) {
+    localPort_.store(ntohs(local.sin_port));
+  }
+}
+
+int HostSocket::Connect(const char* ip, unsigned short port) {
+  sockaddr_in peer{};
+  if (!ParseAddress(ip, port, peer)) {
+    return -1;
+  }
+  return tcp_ ? ConnectTcp(peer) : ConnectUdp(peer);
+}
+
+int HostSocket::ConnectUdp(const sockaddr_in& peer) {
+  // No kernel connect: a connected UDP socket would drop datagrams from any
+  // other sender, and a broadcast request must accept the answer of
+  // whichever device replies.
+  const std::lock_guard<std::mutex> lock(sendMutex_);
+  peer_ = peer;
+  hasPeer_ = true;
+  return 0;
+}
+
+int HostSocket::ConnectTcp(const sockaddr_in& peer) {
+  const std::lock_guard<std::mutex> lock(receiveMutex_);
+  if (needsRenewal_ && !Renew()) {
+    return -1;
+  }
+  needsRenewal_ = true;
+  connected_.store(false);
+  rxBegin_ = rxEnd_ = 0;
+  bool ok = ::connect(fd_.Get(), reinterpret_cast<const sockaddr*>(&peer), sizeof peer) == 0;
+  if (!ok && errno == EINPROGRESS) {
+    const Clock::time_point deadline = Clock::now() + timeouts_.connect;
+    if (WaitFor(fd_.Get(), POLLOUT, deadline) == WaitResult::Ready) {
+      int error = 0;
+      socklen_t length = sizeof error;
+      ok = ::getsockopt(fd_.Get(), SOL_SOCKET, SO_ERROR, &error, &length) == 0 && error == 0;
+    }
+  }
+  if (!ok) {
+    broken_.store(true);
+    // Abandon the attempt now, so no late handshake completes a connection
+    // nobody reads; the fresh descriptor is ready for the next Connect.
+    Renew();
+    return -1;
+  }
+  connected_.store(true);
+  broken_.store(false);
+  return 0;
+}
+
+bool HostSocket::Renew() {
+  std::string error;
+  FileDescriptor fresh = Open(tcp_, error);
+  if (!fresh.Valid()) {
+    return false;
+  }
+  {
+    const std::lock_guard<std::mutex> lock(sendMutex_);
+    connected_.store(false);
+    // dup2 closes the old socket (releasing its port) and puts the fresh one
+    // under the same number in one step.
+    if (::dup2(fresh.Get(), fd_.Get()) < 0) {
+      return false;
+    }
+  }
+  if (!Bind(fd_.Get(), configuredPort_, error)) {
+    // Left unbound: the next Connect renews again rather than connect from
+    // a port the system picks.
+    needsRenewal_ = true;
+    return false;
+  }
+  needsRenewal_ = false;
+  RecordLocalPort();
+  return true;
+}
+
+int HostSocket::IsBroken() {
+  if (!tcp_) {
+    return 0;
+  }
+  const std::lock_guard<std::mutex> lock(receiveMutex_);
+  if (broken_.load()) {
+    return 1;
+  }
+  if (!connected_.load() || rxBegin_ < rxEnd_) {
+    return 0;
+  }
+  // Peek, so a byte that is there stays for Receive; 0 means the peer closed
+  // after everything it sent has been taken.
+  unsigned char probe = 0;
+  const ssize_t n = ::recv(fd_.Get(), &probe, 1, MSG_PEEK | MSG_DONTWAIT);
+  if (n > 0 || (n < 0 && (WouldBlock(errno) || errno == EINTR))) {
+    return 0;
+  }
+  broken_.store(true);
+  return 1;
+}
+
+int HostSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMilliseconds) {
+  if (buffer == nullptr || maxLength <= 0) {
+    return -1;
+  }
+  const Clock::time_point deadline =
+      Clock::now() + std::chrono::milliseconds(std::max(timeoutMilliseconds, 0));
+  const std::lock_guard<std::mutex> lock(receiveMutex_);
+  return tcp_ ? ReceiveTcp(buffer, maxLength, deadline) : ReceiveUdp(buffer, maxLength, deadline);
+}
+
+int HostSocket::ServeBuffered(unsigned char* buffer, int maxLength) {
+  const std::size_t count = std::min(rxEnd_ - rxBegin_, static_cast<std::size_t>(maxLength));
+  std::memcpy(buffer, rxBuffer_.data() + rxBegin_, count);
+  rxBegin_ += count;
+  return static_cast<int>(count);
+}
+
+int HostSocket::ReceiveTcp(unsigned char* buffer, int maxLength, Clock::time_point deadline) {
+  if (rxBegin_ < rxEnd_) {
+    return ServeBuffered(buffer, maxLength);
+  }
+  if (!connected_.load() || broken_.load()) {
+    return -1;
+  }
+  for (;;) {
+    const WaitResult wait = WaitFor(fd_.Get(), POLLIN, deadline);
+    if (wait == WaitResult::TimedOut || wait == WaitResult::Stopped) {
+      return 0;
+    }
+    if (wait == WaitResult::Failed) {
+      return -1;
+    }
+    const ssize_t n = ::recv(fd_.Get(), rxBuffer_.data(), rxBuffer_.size(), MSG_DONTWAIT);
+    if (n > 0) {
+      rxBegin_ = 0;
+      rxEnd_ = static_cast<std::size_t>(n);
+      return ServeBuffered(buffer, maxLength);
+    }
+    if (n < 0 && (WouldBlock(errno) || errno == EINTR)) {
+      continue;
+    }
+    // 0: the peer closed; otherwise reset or failed.
+    broken_.store(true);
+    return -1;
+  }
+}
+
+int HostSocket::ReceiveUdp(unsigned char* buffer, int maxLength, Clock::time_point deadline) {
+  for (;;) {
+    const WaitResult wait = WaitFor(fd_.Get(), POLLIN, deadline);
+    if (wait == WaitResult::TimedOut || wait == WaitResult::Stopped) {
+      return 0;
+    }
+    if (wait == WaitResult::Failed) {
+      return -1;
+    }
+    // One datagram per call; the kernel truncates it to the buffer and drops
+    // the rest.
+    const ssize_t n = ::recv(fd_.Get(), buffer, static_cast<std::size_t>(maxLength), MSG_DONTWAIT);
+    if (n >= 0) {
+      return static_cast<int>(n);
+    }
+    if (!WouldBlock(errno) && errno != EINTR) {
+      return -1;
+    }
+  }
+}
+
+int HostSocket::GetAdapterInfo(unsigned int ip, unsigned int* address, unsigned int* mask,
+                               unsigned int* index) {
+  return AdapterLookup::FindInto(ip, address, mask, index);
+}
+
+int HostSocket::Send(const unsigned char* data, int length) {
+  if (length < 0 || (data == nullptr && length > 0)) {
+    return -1;
+  }
+  const std::lock_guard<std::mutex> lock(sendMutex_);
+  const auto size = static_cast<std::size_t>(length);
+  return tcp_ ? SendTcp(data, size) : SendUdp(data, size);
+}
+
+int HostSocket::SendTcp(const unsigned char* data, std::size_t length) {
+  if (!connected_.load() || broken_.load()) {
+    return -1;
+  }
+  const Clock::time_point deadline = Clock::now() + timeouts_.send;
+  std::size_t sent = 0;
+  while (sent < length) {
+    const ssize_t n = ::send(fd_.Get(), data + sent, length - sent, MSG_NOSIGNAL | MSG_DONTWAIT);
+    if (n > 0) {
+      sent += static_cast<std::size_t>(n);
+      continue;
+    }
+    if (n < 0 && errno == EINTR) {
+      continue;
+    }
+    const bool full = n < 0 && WouldBlock(errno);
+    if (full && WaitWritable(deadline)) {
+      continue;
+    }
+    if (!full || sent > 0) {
+      // A failed connection, or a frame cut in two: either way the stream
+      // can carry nothing more.
+      broken_.store(true);
+      ::shutdown(fd_.Get(), SHUT_RDWR);
+    }
+    return -1;
+  }
+  return static_cast<int>(length);
+}
+
+int HostSocket::SendUdp(const unsigned char* data, std::size_t length) {
+  if (!hasPeer_) {
+    return -1;
+  }
+  const Clock::time_point deadline = Clock::now() + timeouts_.send;
+  for (;;) {
+    const ssize_t n = ::sendto(fd_.Get(), data, length, MSG_NOSIGNAL | MSG_DONTWAIT,
+                               reinterpret_cast<const sockaddr*>(&peer_), sizeof peer_);
+    if (n >= 0) {
+      return static_cast<std::size_t>(n) == length ? static_cast<int>(length) : -1;
+    }
+    if (errno == EINTR || (WouldBlock(errno) && WaitWritable(deadline))) {
+      continue;
+    }
+    return -1;
+  }
+}
+
+bool HostSocket::WaitWritable(Clock::time_point deadline) {
+  return WaitFor(fd_.Get(), POLLOUT, deadline) == WaitResult::Ready;
+}

@@ -1,0 +1,111 @@
+#include "HostTask.h"
+
+#include <pthread.h>
+#include <sys/eventfd.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdint>
+#include <cstdio>
+#include <exception>
+#include <system_error>
+#include <utility>
+
+namespace {
+
+// The task running on this thread; set for the lifetime of the task's thread
+// only, so socket calls can find their task's stop descriptor.
+thread_local HostTask* currentTask = nullptr;
+
+FileDescriptor OpenStopSignal() {
+  FileDescriptor fd(::eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK));
+  if (!fd.Valid()) {
+    throw std::system_error(errno, std::generic_category(), "eventfd for a task stop signal");
+  }
+  return fd;
+}
+
+}  // namespace
+
+HostTask::HostTask(ITaskRunner* runner, int setting, std::string name)
+    : runner_(runner), setting_(setting), name_(std::move(name)), stopSignal_(OpenStopSignal()) {}
+
+HostTask::~HostTask() {
+  RequestStop();
+  std::thread thread;
+  {
+    const std::lock_guard<std::mutex> lock(stateMutex_);
+    thread = std::move(thread_);
+  }
+  if (thread.joinable()) {
+    thread.join();
+  }
+}
+
+int HostTask::IsStopping() const { return stopping_.load() ? 1 : 0; }
+
+bool HostTask::Start() {
+  const std::lock_guard<std::mutex> lock(stateMutex_);
+  if (started_) {
+    return false;
+  }
+  try {
+    thread_ = std::thread(&HostTask::Run, this);
+  } catch (const std::system_error&) {
+    return false;
+  }
+  started_ = true;
+  return true;
+}
+
+void HostTask::RequestStop() {
+  if (stopping_.exchange(true)) {
+    return;
+  }
+  // The counter is never read back: the descriptor stays readable, so every
+  // later poll on it wakes too.
+  const std::uint64_t one = 1;
+  ssize_t written = 0;
+  do {
+    written = ::write(stopSignal_.Get(), &one, sizeof one);
+  } while (written < 0 && errno == EINTR);
+}
+
+bool HostTask::WaitEnded(std::chrono::milliseconds wait) {
+  std::unique_lock<std::mutex> lock(stateMutex_);
+  if (!started_) {
+    return true;
+  }
+  if (wait.count() < 0) {
+    wait = std::chrono::milliseconds(0);
+  }
+  return endedChanged_.wait_for(lock, wait, [this] { return ended_; });
+}
+
+bool HostTask::IsCurrentThread() const { return currentTask == this; }
+
+HostTask* HostTask::Current() { return currentTask; }
+
+int HostTask::CurrentStopDescriptor() {
+  return currentTask == nullptr ? -1 : currentTask->stopSignal_.Get();
+}
+
+void HostTask::Run() {
+  currentTask = this;
+  // Debuggers show the name; the kernel keeps at most 15 characters.
+  const std::string shortName = name_.substr(0, 15);
+  ::pthread_setname_np(::pthread_self(), shortName.c_str());
+  try {
+    runner_->Task();
+  } catch (const std::exception& e) {
+    std::fprintf(stderr, "velt host: task %s ended by an exception: %s\n", name_.c_str(), e.what());
+  } catch (...) {
+    std::fprintf(stderr, "velt host: task %s ended by an unknown exception\n", name_.c_str());
+  }
+  currentTask = nullptr;
+  {
+    const std::lock_guard<std::mutex> lock(stateMutex_);
+    ended_ = true;
+  }
+  endedChanged_.notify_all();
+}

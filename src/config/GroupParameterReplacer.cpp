@@ -1,0 +1,111 @@
+#include "config/GroupParameterReplacer.h"
+
+#include <utility>
+
+namespace {
+
+// The live form of a staged entry: its type and the member of that type.
+ParameterReplacer::Variant ToLive(const GroupParameterReplacer::Variant& staged) {
+  ParameterReplacer::Variant live;
+  live.type = staged.type;
+  live.boolValue = staged.boolValue;
+  live.intValue = staged.intValue;
+  live.stringValue = staged.stringValue;
+  return live;
+}
+
+}  // namespace
+
+std::string GroupParameterReplacer::makeFullName(const std::string& name, int node) {
+  return ParameterReplacer::makeFullName(name, node);
+}
+
+void GroupParameterReplacer::set(const std::string& name, int node, const char* value) {
+  Variant entry;
+  entry.type = ParameterReplacer::kString;
+  entry.stringValue = value == nullptr ? std::string() : std::string(value);
+  stage(name, node, std::move(entry));
+}
+
+void GroupParameterReplacer::set(const std::string& name, int node, bool value) {
+  Variant entry;
+  entry.type = ParameterReplacer::kBoolean;
+  entry.boolValue = value;
+  stage(name, node, std::move(entry));
+}
+
+void GroupParameterReplacer::set(const std::string& name, int node, int value) {
+  Variant entry;
+  entry.type = ParameterReplacer::kInteger;
+  entry.intValue = value;
+  stage(name, node, std::move(entry));
+}
+
+bool GroupParameterReplacer::get(const std::string& name, int node, std::string& out) const {
+  const std::lock_guard<std::mutex> lock(mutex);
+  const Variant* const entry = findTyped(name, node, ParameterReplacer::kString);
+  if (entry == nullptr) {
+    return false;
+  }
+  out = entry->stringValue;
+  return true;
+}
+
+bool GroupParameterReplacer::get(const std::string& name, int node, int& out) const {
+  const std::lock_guard<std::mutex> lock(mutex);
+  const Variant* const entry = findTyped(name, node, ParameterReplacer::kInteger);
+  if (entry == nullptr) {
+    return false;
+  }
+  out = entry->intValue;
+  return true;
+}
+
+bool GroupParameterReplacer::get(const std::string& name, int node, bool& out) const {
+  const std::lock_guard<std::mutex> lock(mutex);
+  const Variant* const entry = findTyped(name, node, ParameterReplacer::kBoolean);
+  if (entry == nullptr) {
+    return false;
+  }
+  out = entry->boolValue;
+  return true;
+}
+
+void GroupParameterReplacer::activate(ParameterReplacer& live, int node, bool persist) const {
+  const std::lock_guard<std::mutex> lock(mutex);
+  for (const auto& [fullName, entry] : values) {
+    if (entry.node != node) {
+      continue;
+    }
+    const std::string liveName = ParameterReplacer::makeFullName(entry.name, node);
+    const ParameterReplacer::Variant value = ToLive(entry);
+    // The live set refuses an entry of an unknown type; such an entry is
+    // neither applied nor persisted.
+    if (live.set(liveName, value) && persist) {
+      live.persist(liveName, value);
+    }
+  }
+}
+
+std::map<std::string, GroupParameterReplacer::Variant> GroupParameterReplacer::entries() const {
+  const std::lock_guard<std::mutex> lock(mutex);
+  return values;
+}
+
+void GroupParameterReplacer::stage(const std::string& name, int node, Variant entry) {
+  entry.name = name;
+  entry.node = node;
+  const std::string fullName = makeFullName(name, node);
+  const std::lock_guard<std::mutex> lock(mutex);
+  values[fullName] = std::move(entry);
+}
+
+const GroupParameterReplacer::Variant* GroupParameterReplacer::findTyped(const std::string& name,
+                                                                         int node,
+                                                                         std::int32_t type) const {
+  const auto found = values.find(makeFullName(name, node));
+  if (found == values.end() || found->second.type != type) {
+    return nullptr;
+  }
+  return &found->second;
+}

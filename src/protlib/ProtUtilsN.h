@@ -1,0 +1,7 @@
+#pragma once
+
+// The framework's free utilities in one include.
+#include "protlib/BitUtils.h"
+#include "protlib/DataTypes.h"
+#include "protlib/TextUtils.h"
+#include "protlib/TimeStamp.h"

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <cstdint>
+
+// Counts the calls of the global allocation functions (every form of
+// operator new and operator new[]) made by the calling thread since the
+// counter was created. Linking the velt_allocation_counter library replaces
+// those functions for the whole test program, with plain malloc-backed ones
+// that count; other threads' allocations never show up in this thread's
+// count.
+//
+//   const AllocationCounter counter;
+//   CodeUnderTest();
+//   EXPECT_EQ(counter.count(), 0U);
+class AllocationCounter {
+ public:
+  AllocationCounter();
+
+  // Allocations made on this thread since construction.
+  std::uint64_t count() const;
+
+ private:
+  std::uint64_t start;
+};

@@ -1,0 +1,45 @@
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "FileDescriptor.h"
+
+// Plain BSD-socket helpers for the tests' side of a loopback conversation.
+namespace LoopbackIo {
+
+using Bytes = std::vector<unsigned char>;
+
+// A TCP socket listening on 127.0.0.1 at a port the system picks.
+FileDescriptor Listen(int backlog, std::uint16_t& port);
+// The next connection on a listening socket; invalid after the time-out.
+FileDescriptor Accept(int listener, std::chrono::milliseconds timeout);
+// A blocking TCP connection to 127.0.0.1:port; invalid on failure.
+FileDescriptor ConnectTo(std::uint16_t port);
+// A UDP socket bound to address (host order) at a port the system picks.
+FileDescriptor BindUdp(std::uint32_t address, std::uint16_t& port);
+// A port on which nothing listens: it stays bound (so nobody else takes
+// it) but never listens, so connects to it are refused.
+FileDescriptor ClosedTcpPort(std::uint16_t& port);
+
+// The local port of a socket.
+std::uint16_t LocalPort(int fd);
+// The peer's port of a connected socket.
+std::uint16_t PeerPort(int fd);
+
+void SendAll(int fd, const Bytes& data);
+void SendTo(int fd, std::uint16_t port, const Bytes& data);
+// Reads until count bytes arrived, the peer closed, or the time-out elapsed.
+Bytes ReceiveUpTo(int fd, std::size_t count, std::chrono::milliseconds timeout);
+// One datagram (and its sender's port); empty with port 0 on time-out.
+Bytes ReceiveDatagram(int fd, std::chrono::milliseconds timeout, std::uint16_t* senderPort);
+// Closes with an immediate reset instead of an orderly close.
+void Reset(FileDescriptor& fd);
+
+// count bytes of a recognisable pattern.
+Bytes Pattern(std::size_t count, unsigned seed = 0);
+Bytes FromText(const std::string& text);
+
+}  // namespace LoopbackIo
