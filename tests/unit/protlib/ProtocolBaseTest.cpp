@@ -499,6 +499,12 @@ TEST(ProtocolBaseDatagrams, CountZeroIsFalseWithoutReadingTheArray) {
   EXPECT_FALSE(protocol.CanAddToDatagram(nullptr, 0, &tag));
   MemoryProtocolWithOverrides grouping;
   EXPECT_FALSE(grouping.CanAddToDatagram(nullptr, 0, &tag));
+  // With an array present the answer stays false and the first entry is not
+  // asked about, although every other condition would hold.
+  const ITag* tags[] = {&tag};
+  EXPECT_FALSE(protocol.CanAddToDatagram(tags, 0, &tag));
+  EXPECT_FALSE(grouping.CanAddToDatagram(tags, 0, &tag));
+  EXPECT_TRUE(grouping.CanAddToDatagram(tags, 1, &tag));
   EXPECT_EQ(protocol.calls, 0);
 }
 
