@@ -14,14 +14,14 @@ DatagramFraming::DatagramFraming(const std::string& prefix, const std::string& s
 
 std::size_t DatagramFraming::Find(const std::string& marker, const unsigned char* data,
                                   std::size_t from, std::size_t end) {
-  const auto* const zero = static_cast<const unsigned char*>(std::memchr(data + from, 0, end - from));
+  const auto* const zero =
+      static_cast<const unsigned char*>(std::memchr(data + from, 0, end - from));
   const std::size_t limit = zero == nullptr ? end : static_cast<std::size_t>(zero - data);
   const auto* const first = data + from;
   const auto* const last = data + limit;
-  const auto* const match = std::search(first, last, marker.begin(), marker.end(),
-                                        [](unsigned char a, char b) {
-                                          return a == static_cast<unsigned char>(b);
-                                        });
+  const auto* const match =
+      std::search(first, last, marker.begin(), marker.end(),
+                  [](unsigned char a, char b) { return a == static_cast<unsigned char>(b); });
   return match == last ? end : static_cast<std::size_t>(match - data);
 }
 

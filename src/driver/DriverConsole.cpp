@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "driver/Protocol_VELT.h"
+#include "protlib/BaseConsole.h"
 #include "protlib/ProtUtilsN.h"
 
 namespace {
@@ -20,16 +21,8 @@ const char kHelp[] =
     "tokens_available - get number of tokens received\n"
     "token_ack - acknowledge reading token\n";
 
-// Copies reply as strncpy does with the whole size: zero-padded when
-// shorter, unterminated when as long or longer.
 void Reply(char* output, int outputSize, const std::string& reply) {
-  if (output == nullptr || outputSize <= 0) {
-    return;
-  }
-  const auto size = static_cast<std::size_t>(outputSize);
-  const std::size_t length = std::min(size, std::strlen(reply.c_str()));
-  std::memcpy(output, reply.data(), length);
-  std::memset(output + length, 0, size - length);
+  BaseConsole::CopyReply(output, outputSize, reply.c_str());
 }
 
 bool Failure(char* output, int outputSize, const std::string& reply) {
@@ -65,15 +58,13 @@ bool DriverConsole::Help(const std::string& command, char* output, int outputSiz
     return false;
   }
   // The base reply may fill the buffer without a terminator.
-  const int used = outputSize <= 0 ? 0
-                                   : static_cast<int>(strnlen(output, static_cast<std::size_t>(
-                                                                          outputSize)));
+  const int used =
+      outputSize <= 0 ? 0 : static_cast<int>(strnlen(output, static_cast<std::size_t>(outputSize)));
   Reply(output + used, outputSize - used, kHelp);
   return true;
 }
 
-bool DriverConsole::Connect(const std::vector<std::string>& words, char* output,
-                            int outputSize) {
+bool DriverConsole::Connect(const std::vector<std::string>& words, char* output, int outputSize) {
   if (words.size() < 2) {
     return Failure(output, outputSize, "ERROR: new connect state is missing");
   }
@@ -84,8 +75,7 @@ bool DriverConsole::Connect(const std::vector<std::string>& words, char* output,
   return Failure(output, outputSize, "ERROR: wrong value");
 }
 
-bool DriverConsole::SetIpPort(const std::vector<std::string>& words, char* output,
-                              int outputSize) {
+bool DriverConsole::SetIpPort(const std::vector<std::string>& words, char* output, int outputSize) {
   if (words.size() < 3) {
     return Failure(output, outputSize, "ERROR: IP and port are missing");
   }

@@ -16,6 +16,7 @@
 #include "factory/HostServices.h"
 #include "protlib/HexText.h"
 #include "protlib/ProtUtilsN.h"
+#include "protlib/ScratchBuffer.h"
 
 namespace {
 
@@ -27,7 +28,8 @@ constexpr int kDatagramTimeout = 20;
 constexpr int kDefaultGap = 500;
 constexpr int kMaxFailedConnects = 100;
 // Work buffers up to this size live on the stack.
-constexpr int kStackBuffer = 128;
+constexpr std::size_t kStackBuffer = 128;
+using WorkBuffer = ScratchBuffer<kStackBuffer>;
 
 struct MemoryTypeEntry {
   const char* name;
@@ -91,24 +93,6 @@ Model BuildModel() {
   model.setMaxDatagramLength(0);
   return model;
 }
-
-// A zero-filled work buffer: on the stack up to kStackBuffer bytes, on the
-// heap above.
-class WorkBuffer {
- public:
-  explicit WorkBuffer(std::size_t size) : size_(size) {
-    if (size_ > sizeof stack_) {
-      heap_.assign(size_, 0);
-    }
-  }
-  unsigned char* data() { return heap_.empty() ? stack_ : heap_.data(); }
-  std::size_t size() const { return size_; }
-
- private:
-  std::size_t size_;
-  unsigned char stack_[kStackBuffer] = {};
-  std::vector<unsigned char> heap_;
-};
 
 // Writes an integer as the natural type of its memory type (host byte order),
 // within room bytes.
@@ -368,9 +352,9 @@ bool Protocol_VELT::CanBeOptimized(const ITag* tag1, const ITag* tag2, bool flag
     if (ProtUtilsN::GetBasicType(second) == ICU_BOOLEAN) {
       offset /= 8;
     }
-    span = (length + offset * ProtUtilsN::GetBasicLength(second) + second->PackedLen() - 1) /
-               length +
-           second->getIndex() - first->getIndex();
+    span =
+        (length + offset * ProtUtilsN::GetBasicLength(second) + second->PackedLen() - 1) / length +
+        second->getIndex() - first->getIndex();
   }
   return span <= blockRead;
 }
@@ -599,7 +583,7 @@ bool Protocol_VELT::readBlock(const Tag_VELT* tag, unsigned char* buffer, int le
     SetError(-1, "illegal memtype to read");
     return false;
   }
-  WorkBuffer work(size);
+  WorkBuffer work(static_cast<int>(size));
   const int blockRead = std::max(type.getBlockReadCount(), 1);
   std::size_t position = 0;
   for (long long left = items; left > 0;) {
@@ -761,7 +745,7 @@ bool Protocol_VELT::writeBlock(const Tag_VELT* tag, const unsigned char* data) {
     return false;
   }
   // Eight spare zero bytes past the value terminate any text.
-  WorkBuffer work(static_cast<std::size_t>(std::max<long long>(packed, first + span) + 8));
+  WorkBuffer work(static_cast<int>(std::max<long long>(packed, first + span) + 8));
   const int blockRead = type.getBlockReadCount();
   if (!(first == 0 && span == packed)) {
     // Keep the bytes of partly covered items.

@@ -33,8 +33,7 @@ bool StreamFraming::Synchronise(const ReceiveByte& receive, std::string& accumul
   return true;
 }
 
-bool StreamFraming::EndsToken(std::string& accumulator, std::size_t taken,
-                              const Emit& emit) const {
+bool StreamFraming::EndsToken(std::string& accumulator, std::size_t taken, const Emit& emit) const {
   if (taken < prefix_.size() + suffix_.size()) {
     return false;
   }
@@ -42,8 +41,7 @@ bool StreamFraming::EndsToken(std::string& accumulator, std::size_t taken,
     if (!EndsWith(accumulator, suffix_)) {
       return false;
     }
-    emit(accumulator.substr(prefix_.size(),
-                            accumulator.size() - prefix_.size() - suffix_.size()));
+    emit(accumulator.substr(prefix_.size(), accumulator.size() - prefix_.size() - suffix_.size()));
     return true;
   }
   // Without a suffix the next prefix closes the token and opens the next one;

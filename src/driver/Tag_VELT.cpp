@@ -12,10 +12,9 @@ namespace {
 // offered by the model today but stays in the list, so a model that offers it
 // makes it a runtime parameter at once.
 const char* const kRuntimeParameters[] = {
-    "SP_SocketType", "SP_RemoteIP",      "SP_RemotePort", "SP_LocalIP",
-    "SP_LocalPort",  "SP_ConnectTimeout", "SP_BroadcastType", "SP_RxPrefix",
-    "SP_RxSuffix",   "SP_TxPrefix",      "SP_TxSuffix",   "SP_Gap",
-    "SP_HexTokens",  "SP_TokenQueueSize", "SP_Done"};
+    "SP_SocketType",     "SP_RemoteIP",      "SP_RemotePort", "SP_LocalIP",        "SP_LocalPort",
+    "SP_ConnectTimeout", "SP_BroadcastType", "SP_RxPrefix",   "SP_RxSuffix",       "SP_TxPrefix",
+    "SP_TxSuffix",       "SP_Gap",           "SP_HexTokens",  "SP_TokenQueueSize", "SP_Done"};
 
 bool IsRuntimeParameterName(const std::string& name) {
   for (const char* candidate : kRuntimeParameters) {
@@ -28,8 +27,7 @@ bool IsRuntimeParameterName(const std::string& name) {
 
 }  // namespace
 
-Tag_VELT::Tag_VELT(const char* uri_, Protocol_VELT* protocol)
-    : uri(uri_ == nullptr ? "" : uri_) {
+Tag_VELT::Tag_VELT(const char* uri_, Protocol_VELT* protocol) : uri(uri_ == nullptr ? "" : uri_) {
   valid = parseTagUrl(protocol) ? 1 : 0;
 }
 

@@ -85,7 +85,8 @@ TEST_F(ConsoleTest, PutSendsTheRestOfTheLineWithItsBlanks) {
   bool ok = false;
   EXPECT_EQ(Command("put   hello  big world", &ok), "OK");
   EXPECT_TRUE(ok);
-  EXPECT_EQ(Sock().Sends(), std::vector<std::string>{Bytes("02") + "hello  big world" + Bytes("03")});
+  EXPECT_EQ(Sock().Sends(),
+            std::vector<std::string>{Bytes("02") + "hello  big world" + Bytes("03")});
 }
 
 TEST_F(ConsoleTest, PutWithNothingToSend) {

@@ -241,10 +241,10 @@ TEST_F(ProtocolLifecycleTest, StartReadsTheThirteenLiveNamesInOrder) {
       asked.push_back(call.name);
     }
   }
-  EXPECT_EQ(asked, (std::vector<std::string>{
-                       "socket_type", "remote_ip_address", "remote_port", "local_ip_address",
-                       "local_port", "broadcast_type", "rx_prefix", "rx_suffix", "gap", "tx_prefix",
-                       "tx_suffix", "hex_tokens", "token_queue_size"}));
+  EXPECT_EQ(asked, (std::vector<std::string>{"socket_type", "remote_ip_address", "remote_port",
+                                             "local_ip_address", "local_port", "broadcast_type",
+                                             "rx_prefix", "rx_suffix", "gap", "tx_prefix",
+                                             "tx_suffix", "hex_tokens", "token_queue_size"}));
   EXPECT_EQ(protocol->getSettings().remotePort, 7777);
   EXPECT_EQ(protocol->getSettings().remoteIp, "127.0.0.1");
 }
@@ -260,8 +260,8 @@ TEST_F(ProtocolLifecycleTest, StoredValuesLiveUnderTheInstanceIdentity) {
 TEST_F(ProtocolLifecycleTest, LaterConfigDoesNotChangeTheLiveValuesOfTheSameChannel) {
   Protocol_VELT& p = Started(kUdpConfig);
   p.Stop();
-  ASSERT_TRUE(p.Config(
-      "CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.5 remotePort=9 gap=40"));
+  ASSERT_TRUE(
+      p.Config("CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.5 remotePort=9 gap=40"));
   p.Start();
   EXPECT_EQ(p.getSettings().socketType, "UDP");
   EXPECT_EQ(p.getSettings().remoteIp, "127.0.0.1");
@@ -272,8 +272,8 @@ TEST_F(ProtocolLifecycleTest, LaterConfigDoesNotChangeTheLiveValuesOfTheSameChan
 TEST_F(ProtocolLifecycleTest, NewChannelStartsFromTheNewConfiguration) {
   Started(kUdpConfig);
   Destroy();
-  Protocol_VELT& p = Started(
-      "CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.5 remotePort=9 gap=40");
+  Protocol_VELT& p =
+      Started("CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.5 remotePort=9 gap=40");
   EXPECT_EQ(p.getSettings().socketType, "TCP");
   EXPECT_EQ(p.getSettings().remoteIp, "127.0.0.5");
   EXPECT_EQ(p.getSettings().gap, 40);
@@ -288,8 +288,8 @@ TEST_F(ProtocolLifecycleTest, DestroyingARunningChannelStopsItFirst) {
 }
 
 TEST_F(ProtocolLifecycleTest, ProtocolFactoryCreatesIndependentChannels) {
-  auto* const factory = static_cast<IProtocolFactory*>(
-      GetInterfaceFactory()->CreateInterface("IProtocolFactory"));
+  auto* const factory =
+      static_cast<IProtocolFactory*>(GetInterfaceFactory()->CreateInterface("IProtocolFactory"));
   IProtocol* const first = factory->CreateProtocol("VELT");
   IProtocol* const second = factory->CreateProtocol("VELT");
   ASSERT_NE(first, nullptr);

@@ -36,7 +36,8 @@ TEST_F(TagTest, EmptyNodeFieldIsNodeZero) {
 }
 
 TEST_F(TagTest, TwoOrFourFieldsAreRefused) {
-  const std::string expected = "Tag URI error: ?rx_token - there must be 3 tag specification fields";
+  const std::string expected =
+      "Tag URI error: ?rx_token - there must be 3 tag specification fields";
   EXPECT_EQ(Refused("?rx_token"), expected);
   EXPECT_EQ(Refused("?rx_token?string-10?"),
             "Tag URI error: ?rx_token?string-10? - there must be 3 tag specification fields");
@@ -89,18 +90,32 @@ TEST_F(TagTest, UnknownDataType) {
 }
 
 TEST_F(TagTest, BooleanOnTxTokenIsNotAllowed) {
-  EXPECT_EQ(Refused("?tx_token?boolean"), "Tag URI error: ?tx_token?boolean - not allowed tavu type");
+  EXPECT_EQ(Refused("?tx_token?boolean"),
+            "Tag URI error: ?tx_token?boolean - not allowed tavu type");
 }
 
 TEST_F(TagTest, AllowedTypesFollowEachMask) {
-  for (const char* uri :
-       {"?tx_token?string-8", "?rx_token?string-8", "?SP_SocketType?string-4", "?SP_RemoteIP?string-16",
-        "?SP_LocalIP?string-16", "?SP_BroadcastType?string-8", "?SP_RxPrefix?string-8",
-        "?SP_RxSuffix?string-8", "?SP_TxPrefix?string-8", "?SP_TxSuffix?string-8",
-        "?rx_token_len?unsignedInt", "?tokens_available?unsignedInt", "?SP_Gap?unsignedInt",
-        "?SP_TokenQueueSize?unsignedInt", "?SP_RemotePort?unsignedShort",
-        "?SP_LocalPort?unsignedShort", "?token_ack?boolean", "?SP_HexTokens?boolean",
-        "?SP_Done?boolean", "?connect?boolean", "?conn_stat?boolean"}) {
+  for (const char* uri : {"?tx_token?string-8",
+                          "?rx_token?string-8",
+                          "?SP_SocketType?string-4",
+                          "?SP_RemoteIP?string-16",
+                          "?SP_LocalIP?string-16",
+                          "?SP_BroadcastType?string-8",
+                          "?SP_RxPrefix?string-8",
+                          "?SP_RxSuffix?string-8",
+                          "?SP_TxPrefix?string-8",
+                          "?SP_TxSuffix?string-8",
+                          "?rx_token_len?unsignedInt",
+                          "?tokens_available?unsignedInt",
+                          "?SP_Gap?unsignedInt",
+                          "?SP_TokenQueueSize?unsignedInt",
+                          "?SP_RemotePort?unsignedShort",
+                          "?SP_LocalPort?unsignedShort",
+                          "?token_ack?boolean",
+                          "?SP_HexTokens?boolean",
+                          "?SP_Done?boolean",
+                          "?connect?boolean",
+                          "?conn_stat?boolean"}) {
     EXPECT_TRUE(Direct(uri)->IsValid()) << uri;
   }
   for (const char* uri : {"?rx_token_len?int", "?SP_RemotePort?unsignedInt", "?connect?byte",
