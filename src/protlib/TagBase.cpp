@@ -279,27 +279,27 @@ bool TagBase::DoConversion(unsigned char* buffer, const char* name, bool toDevic
   if (buffer == nullptr || name == nullptr || n < 0) {
     return false;
   }
-  const std::string conversion(name);
-  if (conversion == "swapnibble") {
+  const auto is = [name](const char* known) { return std::strcmp(name, known) == 0; };
+  if (is("swapnibble")) {
     SwapNibbles(buffer, n);
     return true;
   }
-  if (conversion == "swap2") {
+  if (is("swap2")) {
     return ReverseGroups(buffer, n, 2);
   }
-  if (conversion == "swap4") {
+  if (is("swap4")) {
     return ReverseGroups(buffer, n, 4);
   }
-  if (conversion == "swap8") {
+  if (is("swap8")) {
     return ReverseGroups(buffer, n, 8);
   }
-  if (conversion == "bcd") {
+  if (is("bcd")) {
     return Bcd(buffer, n, ProtUtilsN::GetBasicLength(this), toDevice);
   }
-  if (conversion == "neg") {
+  if (is("neg")) {
     return Negate(buffer, n, ProtUtilsN::GetBasicType(this), ProtUtilsN::GetItemCount(this));
   }
-  if (conversion == "inv") {
+  if (is("inv")) {
     if (ProtUtilsN::IsBitType(GetVarType())) {
       std::transform(buffer, buffer + n, buffer,
                      [](unsigned char b) { return static_cast<unsigned char>(b == 0 ? 1 : 0); });
