@@ -133,8 +133,7 @@ void FlipSign(unsigned char* item) {
   std::memcpy(item, &value, sizeof value);
 }
 
-// The size of one item that "neg" negates, and how; 0 for a type it does not
-// take.
+// The size of one item that "neg" negates; 0 for a type it does not take.
 int NegatedItemSize(ICU_Type basic) {
   switch (basic) {
     case ICU_BYTE:
@@ -188,16 +187,16 @@ bool Negate(unsigned char* buffer, int n, ICU_Type basic, int count) {
   if (size == 0) {
     return false;
   }
-  const long long step = basic == ICU_BYTE ? 1 : size;
   if (count < 1) {
     return true;
   }
-  // The last position negated is the largest multiple of step below count.
-  const long long last = (static_cast<long long>(count) - 1) / step * step;
+  // The last position negated is the largest multiple of the size below
+  // count (for byte: count - 1).
+  const long long last = (static_cast<long long>(count) - 1) / size * size;
   if (last + size > n) {
     return false;
   }
-  for (long long position = 0; position <= last; position += step) {
+  for (long long position = 0; position <= last; position += size) {
     NegateItem(basic, buffer + position);
   }
   return true;
