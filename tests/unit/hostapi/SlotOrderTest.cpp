@@ -9,6 +9,8 @@
 #include "ISocketFactory.h"
 #include "ITag.h"
 #include "VtableSlot.h"
+#include "protlib/ProtocolBase.h"
+#include "protlib/TagBase.h"
 
 // A host calls every interface by slot, so these indexes are the plug-in's
 // binary interface: a reordering must fail here, never on a panel.
@@ -49,6 +51,16 @@ TEST(SlotOrder, Tag) {
   EXPECT_EQ(VtableSlot(&ITag::ConvertVariable), 10);
   EXPECT_EQ(VtableSlot(&ITag::IsReadOnly), 11);
   EXPECT_EQ(VtableSlot(&ITag::IsWriteOnly), 12);
+}
+
+// The framework's tag base keeps ITag's table and appends its own two.
+TEST(SlotOrder, TagBase) {
+  EXPECT_EQ(VtableSlot(&TagBase::PackedLen), 9);
+  EXPECT_EQ(VtableSlot(&TagBase::ConvertVariable), 10);
+  EXPECT_EQ(VtableSlot(&TagBase::IsReadOnly), 11);
+  EXPECT_EQ(VtableSlot(&TagBase::IsWriteOnly), 12);
+  EXPECT_EQ(VtableSlot(&TagBase::Convert), 13);
+  EXPECT_EQ(VtableSlot(&TagBase::DoConversion), 14);
 }
 
 // Every generation appends to the previous one: the whole table is checked
@@ -139,6 +151,20 @@ TEST(SlotOrder, Protocol7) {
   EXPECT_EQ(VtableSlot(&IProtocol7::readArrayItem), 79) << "readArrayItem";
   EXPECT_EQ(VtableSlot(&IProtocol7::writeArrayItem), 80) << "writeArrayItem";
   EXPECT_EQ(VtableSlot(&IProtocol7::readBitBlockWithTimestamp), 81) << "readBitBlockWithTimestamp";
+}
+
+// The protocol base keeps IProtocol7's table and appends its own operations.
+TEST(SlotOrder, ProtocolBase) {
+  EXPECT_EQ(VtableSlot(&ProtocolBase::ConvertTo), 2);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::Read), 11);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::DoCommand), 31);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::readBitBlockWithTimestamp), 81);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::CreateTagBase), 82);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::GetMaxTm), 83);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::tagUriNames), 84);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::SetError), -1);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::SetTagError), -1);
+  EXPECT_EQ(VtableSlot(&ProtocolBase::DeleteTags), -1);
 }
 
 TEST(SlotOrder, HostServices) {
