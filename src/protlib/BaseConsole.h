@@ -13,8 +13,12 @@ class ProtocolBase;
 // Replies are copied into the caller's buffer as strncpy copies them with the
 // full buffer size: a reply of outSize characters or more fills the buffer
 // without a terminator, a shorter one is followed by zero bytes up to outSize.
-// Nothing is ever written at or after out[outSize]; a negative outSize or a
-// null buffer is taken as a buffer of no characters.
+// Two replies are written in place instead, with no padding: "info" (the
+// information text, then a terminator when there is room) and a successful
+// "read" (two lower-case hexadecimal digits per byte while more than 4
+// characters remain, then a line feed and a terminator as far as there is
+// room). Nothing is ever written at or after out[outSize]; a negative outSize
+// or a null buffer is taken as a buffer of no characters.
 class BaseConsole {
  public:
   explicit BaseConsole(ProtocolBase& owner) : protocol(owner) {}

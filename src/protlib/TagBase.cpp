@@ -133,8 +133,7 @@ void FlipSign(unsigned char* item) {
   std::memcpy(item, &value, sizeof value);
 }
 
-// The size of one item that "neg" negates, and how; 0 for a type it does not
-// take.
+// The size of one item that "neg" negates; 0 for a type it does not take.
 int NegatedItemSize(ICU_Type basic) {
   switch (basic) {
     case ICU_BYTE:
@@ -188,16 +187,16 @@ bool Negate(unsigned char* buffer, int n, ICU_Type basic, int count) {
   if (size == 0) {
     return false;
   }
-  const long long step = basic == ICU_BYTE ? 1 : size;
   if (count < 1) {
     return true;
   }
-  // The last position negated is the largest multiple of step below count.
-  const long long last = (static_cast<long long>(count) - 1) / step * step;
+  // The last position negated is the largest multiple of the size below
+  // count (for byte: count - 1).
+  const long long last = (static_cast<long long>(count) - 1) / size * size;
   if (last + size > n) {
     return false;
   }
-  for (long long position = 0; position <= last; position += step) {
+  for (long long position = 0; position <= last; position += size) {
     NegateItem(basic, buffer + position);
   }
   return true;
@@ -279,27 +278,27 @@ bool TagBase::DoConversion(unsigned char* buffer, const char* name, bool toDevic
   if (buffer == nullptr || name == nullptr || n < 0) {
     return false;
   }
-  const std::string conversion(name);
-  if (conversion == "swapnibble") {
+  const auto is = [name](const char* known) { return std::strcmp(name, known) == 0; };
+  if (is("swapnibble")) {
     SwapNibbles(buffer, n);
     return true;
   }
-  if (conversion == "swap2") {
+  if (is("swap2")) {
     return ReverseGroups(buffer, n, 2);
   }
-  if (conversion == "swap4") {
+  if (is("swap4")) {
     return ReverseGroups(buffer, n, 4);
   }
-  if (conversion == "swap8") {
+  if (is("swap8")) {
     return ReverseGroups(buffer, n, 8);
   }
-  if (conversion == "bcd") {
+  if (is("bcd")) {
     return Bcd(buffer, n, ProtUtilsN::GetBasicLength(this), toDevice);
   }
-  if (conversion == "neg") {
+  if (is("neg")) {
     return Negate(buffer, n, ProtUtilsN::GetBasicType(this), ProtUtilsN::GetItemCount(this));
   }
-  if (conversion == "inv") {
+  if (is("inv")) {
     if (ProtUtilsN::IsBitType(GetVarType())) {
       std::transform(buffer, buffer + n, buffer,
                      [](unsigned char b) { return static_cast<unsigned char>(b == 0 ? 1 : 0); });

@@ -2,10 +2,12 @@
 
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <cstdint>
 #include <cstring>
 #include <memory>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "MemoryProtocol.h"
@@ -101,6 +103,23 @@ class OwnRead final : public MemoryProtocol {
     return true;
   }
   int reads = 0;
+};
+
+// A device that takes a few milliseconds per read and notes when each read
+// ended.
+class SlowDevice final : public MemoryProtocolWithOverrides {
+ public:
+  bool ReadBlock(const ITag* tag, unsigned char* buffer, int length) override {
+    std::this_thread::sleep_for(std::chrono::milliseconds(3));
+    readEnded = ProtUtilsN::currentTimeStamp();
+    return MemoryProtocol::ReadBlock(tag, buffer, length);
+  }
+  bool ReadDatagram(const ITag* const* tags, int count, unsigned char* buffer) override {
+    std::this_thread::sleep_for(std::chrono::milliseconds(3));
+    readEnded = ProtUtilsN::currentTimeStamp();
+    return MemoryProtocolWithOverrides::ReadDatagram(tags, count, buffer);
+  }
+  unsigned long long readEnded = 0;
 };
 
 class NamedFields final : public MemoryProtocol {
@@ -465,6 +484,22 @@ TEST(ProtocolBaseTimestamps, ReadWithTimestampStampsAfterTheRead) {
   EXPECT_GE(ts, before);
   EXPECT_LE(ts, after);
   EXPECT_TRUE(protocol.readWithTimestamp(tag, value, nullptr));
+}
+
+TEST(ProtocolBaseTimestamps, StampsAreTakenAfterTheDeviceRead) {
+  SlowDevice protocol;
+  protocol.bitBlocks = false;
+  TestTagBase tag(ICU_INT, 4);
+  const ITag* tags[] = {&tag};
+  unsigned char value[4] = {};
+  idal_error_t status[1] = {};
+  unsigned long long ts = 0;
+  ASSERT_TRUE(protocol.readWithTimestamp(&tag, value, &ts));
+  EXPECT_GE(ts, protocol.readEnded);
+  ASSERT_TRUE(protocol.readBlockWithTimestamp(&tag, value, 4, &ts));
+  EXPECT_GE(ts, protocol.readEnded);
+  ASSERT_TRUE(protocol.readDatagramWithTimestamp(tags, 1, value, status, &ts));
+  EXPECT_GE(ts, protocol.readEnded);
 }
 
 TEST(ProtocolBaseTimestamps, FailedReadsLeaveTheTimeStamp) {
