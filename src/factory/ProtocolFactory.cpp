@@ -1,5 +1,6 @@
 #include "factory/ProtocolFactory.h"
 
+#include "driver/CreateProtocol_VELT.h"
 #include "factory/CompareInterface.h"
 
 IInterface* ProtocolFactory::ConvertTo(const char* name) {
@@ -14,9 +15,11 @@ const char* ProtocolFactory::GetImpName() const { return "ProtFactoryInDLL"; }
 
 int ProtocolFactory::GetImpVersion() const { return 100; }
 
-IProtocol* ProtocolFactory::CreateProtocol(const char* /*name*/) {
-  // The token driver registers itself here once it exists; until then no
-  // protocol name is known.
+IProtocol* ProtocolFactory::CreateProtocol(const char* name) {
+  // The library makes one protocol: the token channel.
+  if (CompareInterface(name, "VELT") != 0) {
+    return CreateProtocol_VELT();
+  }
   return nullptr;
 }
 

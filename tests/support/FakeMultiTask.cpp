@@ -37,6 +37,8 @@ class FakeMultiTask::Task final : public ITask {
   std::thread thread_;
 };
 
+FakeMultiTask::FakeMultiTask() = default;
+
 FakeMultiTask::~FakeMultiTask() {
   for (auto& task : tasks_) {
     task->Stop();

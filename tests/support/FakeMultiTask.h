@@ -15,7 +15,7 @@
 // is recorded.
 class FakeMultiTask final : public IMultiTask2 {
  public:
-  FakeMultiTask() = default;
+  FakeMultiTask();
   FakeMultiTask(const FakeMultiTask&) = delete;
   FakeMultiTask& operator=(const FakeMultiTask&) = delete;
   FakeMultiTask(FakeMultiTask&&) = delete;

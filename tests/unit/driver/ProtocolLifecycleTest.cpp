@@ -3,6 +3,7 @@
 #include <vector>
 
 #include "DriverFixture.h"
+#include "IProtocolFactory.h"
 #include "driver/XmlDescription.h"
 #include "factory/GetInterfaceFactory.h"
 #include "factory/HostServices.h"
@@ -81,10 +82,10 @@ TEST_F(ProtocolLifecycleTest, ExtendAnswersTheCapabilityRecord) {
   EXPECT_EQ(p.Extend(0, other), 1);
   EXPECT_EQ(std::vector<unsigned char>(other + 4, other + 8),
             (std::vector<unsigned char>{0, 0, 0, 0}));
-  unsigned char host[80] = {};
-  host[68] = 42;
-  EXPECT_EQ(p.Extend(3, host), 42);
-  EXPECT_EQ(p.Extend(1, host), 0);
+  unsigned char hostRecord[80] = {};
+  hostRecord[68] = 42;
+  EXPECT_EQ(p.Extend(3, hostRecord), 42);
+  EXPECT_EQ(p.Extend(1, hostRecord), 0);
   EXPECT_EQ(p.Extend(0, nullptr), 0);
 }
 

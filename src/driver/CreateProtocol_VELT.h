@@ -1,0 +1,8 @@
+#pragma once
+
+#include "IProtocol.h"
+
+// A new token channel, owned by the caller until the protocol factory's
+// DeleteProtocol. An allocation failure passes on as the allocator's
+// exception.
+IProtocol* CreateProtocol_VELT();
