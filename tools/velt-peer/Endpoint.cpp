@@ -4,12 +4,30 @@
 #include <netdb.h>
 #include <netinet/in.h>
 
+#include <cctype>
 #include <cstring>
 #include <memory>
 
 #include "velt-peer/NumberText.h"
 
 namespace veltpeer {
+
+namespace {
+
+// A host name has a letter and no colon (IPv6 addresses have colons; dotted
+// IPv4 addresses have no letters).
+bool LooksLikeName(const std::string& host) {
+  bool letter = false;
+  for (const char c : host) {
+    if (c == ':') {
+      return false;
+    }
+    letter = letter || std::isalpha(static_cast<unsigned char>(c)) != 0;
+  }
+  return letter;
+}
+
+}  // namespace
 
 Endpoint::Endpoint(const sockaddr* address, socklen_t length) {
   if (address != nullptr && length > 0 && length <= sizeof storage_) {
@@ -23,10 +41,16 @@ bool Endpoint::Resolve(const std::string& host, std::uint16_t port, int socketTy
   addrinfo hints{};
   hints.ai_family = AF_UNSPEC;
   hints.ai_socktype = socketType;
-  hints.ai_flags = AI_NUMERICSERV;
+  hints.ai_flags = AI_NUMERICSERV | AI_NUMERICHOST;
   addrinfo* found = nullptr;
   const std::string service = std::to_string(port);
-  const int rc = ::getaddrinfo(host.c_str(), service.c_str(), &hints, &found);
+  int rc = ::getaddrinfo(host.c_str(), service.c_str(), &hints, &found);
+  if (rc == EAI_NONAME && LooksLikeName(host)) {
+    // Only what cannot be an address is looked up as a name, so that a
+    // mistyped address (256.1.1.1) fails at once instead of going to DNS.
+    hints.ai_flags = AI_NUMERICSERV;
+    rc = ::getaddrinfo(host.c_str(), service.c_str(), &hints, &found);
+  }
   if (rc != 0) {
     error = "cannot resolve '" + host + "': " + ::gai_strerror(rc);
     return false;
