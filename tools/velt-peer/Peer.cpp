@@ -3,7 +3,7 @@
 #include <sys/socket.h>
 
 #include <cerrno>
-#include <cstring>
+#include <system_error>
 #include <utility>
 
 #include "velt-peer/ServiceContext.h"
@@ -72,7 +72,7 @@ Peer::Started Peer::Start() {
                                                std::chrono::duration<double>(options_.maxSeconds)));
   }
   activity_.Announce(PeerEvent::Kind::kListening, started.address);
-  worker_ = std::thread(&Peer::Work, this, std::move(fixedDestination));
+  worker_ = std::thread(&Peer::Work, this, fixedDestination);
   return started;
 }
 
@@ -143,7 +143,7 @@ std::string Peer::Bind() {
   }
   socket_.Reset(::socket(local.Family(), type | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
   if (!socket_.Valid()) {
-    return what + local.ToString() + ": " + std::strerror(errno);
+    return what + local.ToString() + ": " + std::generic_category().message(errno);
   }
   if (tcp) {
     // A restarted simulator can take its port back while old connections
@@ -155,7 +155,7 @@ std::string Peer::Bind() {
       (tcp && ::listen(socket_.Get(), kListenBacklog) != 0)) {
     const int reason = errno;
     socket_.Reset();
-    return what + local.ToString() + ": " + std::strerror(reason);
+    return what + local.ToString() + ": " + std::generic_category().message(reason);
   }
   return std::string();
 }
@@ -166,7 +166,7 @@ void Peer::Work(Endpoint fixedDestination) {
   if (options_.transport == Transport::kTcp) {
     failure = TcpService(context, socket_.Get()).Run();
   } else {
-    UdpService(context, socket_.Get(), std::move(fixedDestination)).Run();
+    UdpService(context, socket_.Get(), fixedDestination).Run();
   }
   const std::lock_guard<std::mutex> hold(stateLock_);
   failure_ = std::move(failure);

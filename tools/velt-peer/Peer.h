@@ -52,8 +52,12 @@ class Peer {
   // starts the worker. Only the first call can succeed.
   Started Start();
   // Wakes the worker out of any wait, lets it close its connection and joins
-  // it. Idempotent; returns within milliseconds whatever the worker was doing.
+  // it. Idempotent; returns within milliseconds whatever the worker was doing
+  // (unless the event callback itself is blocked).
   void Stop();
+  // Asks the worker to end as Stop does, without waiting for it; Stop (or the
+  // destructor) still joins it. Thread-safe.
+  void RequestStop() noexcept { stop_.Raise(); }
 
   // True once the worker has ended: by Stop, the time limit, the exit limit
   // or a fatal error.

@@ -2,8 +2,9 @@
 
 #include <sys/socket.h>
 
+#include <algorithm>
+#include <iterator>
 #include <limits>
-#include <set>
 
 #include "velt-peer/Endpoint.h"
 #include "velt-peer/HexText.h"
@@ -24,12 +25,17 @@ constexpr double kMaxRate = 1000000;
 constexpr double kMinRate = 0.001;
 constexpr double kMaxSeconds = 31536000;
 
-const std::set<std::string> kValueOptions = {
+constexpr const char* kValueOptions[] = {
     "--bind",        "--port",           "--to",         "--rx-prefix",  "--rx-suffix",
     "--gap",         "--emit",           "--rate",       "--prefix",     "--suffix",
     "--payload",     "--payload-hex",    "--delay",      "--chunk",      "--chunk-delay",
     "--close-after", "--close-after-ms", "--exit-after", "--max-seconds"};
-const std::set<std::string> kFlagOptions = {"--echo", "--text", "--count"};
+constexpr const char* kFlagOptions[] = {"--echo", "--text", "--count"};
+
+template <std::size_t N>
+bool Listed(const std::string& name, const char* const (&names)[N]) {
+  return std::find(std::begin(names), std::end(names), name) != std::end(names);
+}
 
 constexpr char kUsage[] =
     R"(Usage: velt-peer tcp|udp [options]
@@ -123,7 +129,7 @@ bool PeerCommandLine::Fail(const std::string& error) {
 bool PeerCommandLine::Collect(const std::vector<std::string>& arguments) {
   for (std::size_t i = 0; i < arguments.size(); ++i) {
     const std::string& argument = arguments[i];
-    if (argument.rfind("-", 0) != 0 || argument == "-") {
+    if (argument.size() < 2 || argument[0] != '-') {
       if (!transport_.empty()) {
         return Fail("unexpected argument '" + argument + "'");
       }
@@ -132,8 +138,8 @@ bool PeerCommandLine::Collect(const std::vector<std::string>& arguments) {
     }
     const std::size_t equals = argument.find('=');
     const std::string name = argument.substr(0, equals);
-    const bool takesValue = kValueOptions.count(name) != 0;
-    if (!takesValue && kFlagOptions.count(name) == 0) {
+    const bool takesValue = Listed(name, kValueOptions);
+    if (!takesValue && !Listed(name, kFlagOptions)) {
       return Fail("unknown option '" + name + "'");
     }
     if (values_.count(name) != 0) {

@@ -14,8 +14,7 @@ namespace veltpeer {
 // options, the stop signal, the activity record, the writer, the token
 // emitter (its numbering runs on across connections) and the count of frames
 // handled so far for the exit limit.
-class ServiceContext {
- public:
+struct ServiceContext {
   ServiceContext(const PeerOptions& peerOptions, const StopSignal& stopSignal, PeerActivity& record)
       : options(peerOptions),
         stop(stopSignal),
@@ -26,11 +25,11 @@ class ServiceContext {
   // Counts one frame handled (received or emitted); true once the exit
   // limit is reached.
   bool CountHandled() {
-    ++handledFrames_;
+    ++handledFrames;
     return ExitReached();
   }
   bool ExitReached() const {
-    return options.exitAfterFrames != 0 && handledFrames_ >= options.exitAfterFrames;
+    return options.exitAfterFrames != 0 && handledFrames >= options.exitAfterFrames;
   }
 
   const PeerOptions& options;
@@ -38,9 +37,7 @@ class ServiceContext {
   PeerActivity& activity;
   FrameWriter writer;
   TokenEmitter emitter;
-
- private:
-  std::uint64_t handledFrames_ = 0;
+  std::uint64_t handledFrames = 0;
 };
 
 }  // namespace veltpeer

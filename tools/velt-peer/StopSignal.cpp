@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <climits>
-#include <cstring>
+#include <system_error>
 
 namespace veltpeer {
 
@@ -32,7 +32,7 @@ int PollTimeout(StopSignal::Clock::time_point deadline) {
 bool StopSignal::Open(std::string& error) {
   int ends[2] = {-1, -1};
   if (::pipe2(ends, O_CLOEXEC | O_NONBLOCK) != 0) {
-    error = std::string("cannot create the stop pipe: ") + std::strerror(errno);
+    error = std::string("cannot create the stop pipe: ") + std::generic_category().message(errno);
     return false;
   }
   readEnd_.Reset(ends[0]);

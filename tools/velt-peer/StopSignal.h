@@ -30,6 +30,8 @@ class StopSignal {
   ~StopSignal() = default;
 
   // Creates the wake-up pipe; false with a reason in error when that fails.
+  // A signal that was never opened still honours Raise and the deadlines, but
+  // a Raise from another thread does not wake a wait already in progress.
   bool Open(std::string& error);
   // Sets the end of life; call before any other thread waits.
   void EndAt(Clock::time_point end) { end_ = end; }

@@ -7,7 +7,7 @@
 
 #include <cerrno>
 #include <chrono>
-#include <cstring>
+#include <system_error>
 #include <utility>
 
 #include "velt-peer/Endpoint.h"
@@ -72,7 +72,7 @@ std::string TcpService::Run() {
         context_.stop.SleepFor(kResourcePause);
         continue;
       }
-      return std::string("accept failed: ") + std::strerror(error);
+      return std::string("accept failed: ") + std::generic_category().message(error);
     }
     FileDescriptor socket(fd);
     // Every write, and every piece of a chunked write, goes out at once.

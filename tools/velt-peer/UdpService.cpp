@@ -3,8 +3,6 @@
 #include <poll.h>
 #include <sys/socket.h>
 
-#include <utility>
-
 namespace veltpeer {
 
 namespace {
@@ -14,10 +12,10 @@ constexpr std::size_t kDatagramSize = 65536;
 
 }  // namespace
 
-UdpService::UdpService(ServiceContext& context, int socket, Endpoint fixedDestination)
+UdpService::UdpService(ServiceContext& context, int socket, const Endpoint& fixedDestination)
     : context_(context),
       socket_(socket),
-      fixedDestination_(std::move(fixedDestination)),
+      fixedDestination_(fixedDestination),
       cutter_(context.options.rxPrefix, context.options.rxSuffix),
       buffer_(kDatagramSize) {}
 

@@ -14,7 +14,7 @@ namespace veltpeer {
 // fixed destination or, without one, to the sender of the last datagram.
 class UdpService {
  public:
-  UdpService(ServiceContext& context, int socket, Endpoint fixedDestination);
+  UdpService(ServiceContext& context, int socket, const Endpoint& fixedDestination);
 
   // Runs until the simulator is stopped, expires or reaches its exit limit.
   void Run();

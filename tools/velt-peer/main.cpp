@@ -2,28 +2,28 @@
 
 #include <pthread.h>
 #include <signal.h>
+#include <unistd.h>
 
-#include <cerrno>
+#include <chrono>
 #include <cstdio>
 #include <ctime>
 #include <string>
 #include <vector>
 
+#include "velt-peer/LineWriter.h"
 #include "velt-peer/Peer.h"
 #include "velt-peer/PeerCommandLine.h"
 #include "velt-peer/PeerOutput.h"
+#include "velt-peer/StopSignal.h"
 
 namespace {
 
 constexpr int kRuntimeError = 1;
 constexpr int kUsageError = 2;
 constexpr long kSignalPollNanoseconds = 50L * 1000 * 1000;
-
-void PrintLine(const std::string& line) {
-  std::fwrite(line.data(), 1, line.size(), stdout);
-  std::fputc('\n', stdout);
-  std::fflush(stdout);
-}
+// How long the last lines (closed, totals) may wait for a reader of standard
+// output that has fallen behind, once the run is over.
+constexpr std::chrono::seconds kOutputGrace{2};
 
 void PrintError(const std::string& text) { std::fprintf(stderr, "velt-peer: %s\n", text.c_str()); }
 
@@ -38,6 +38,11 @@ void WaitForEnd(const veltpeer::Peer& peer, const sigset_t& signals) {
       return;
     }
   }
+}
+
+veltpeer::StopSignal::Clock::duration Seconds(double seconds) {
+  return std::chrono::duration_cast<veltpeer::StopSignal::Clock::duration>(
+      std::chrono::duration<double>(seconds));
 }
 
 }  // namespace
@@ -55,7 +60,7 @@ int main(int argc, char** argv) {
     return 0;
   }
   if (commandLine.GetAction() == veltpeer::PeerCommandLine::Action::kVersion) {
-    PrintLine(veltpeer::PeerCommandLine::Version());
+    std::puts(veltpeer::PeerCommandLine::Version().c_str());
     return 0;
   }
 
@@ -67,13 +72,28 @@ int main(int argc, char** argv) {
   pthread_sigmask(SIG_BLOCK, &signals, nullptr);
 
   veltpeer::PeerOptions options = commandLine.Options();
+  // Event lines wait for a slow reader of standard output, but only until
+  // shortly after the run is over, so that a reader that stopped reading
+  // cannot hold velt-peer up.
+  std::string error;
+  veltpeer::StopSignal outputStop;
+  if (!outputStop.Open(error)) {
+    PrintError(error);
+    return kRuntimeError;
+  }
+  if (options.maxSeconds > 0) {
+    outputStop.EndAt(veltpeer::StopSignal::Clock::now() + Seconds(options.maxSeconds) +
+                     kOutputGrace);
+  }
+  veltpeer::LineWriter stdoutLines(STDOUT_FILENO);
   const veltpeer::PeerOutput output(options.transport, commandLine.Text(), commandLine.CountOnly());
-  options.onEvent = [&output](const veltpeer::PeerEvent& event) {
+  options.onEvent = [&](const veltpeer::PeerEvent& event) {
     const std::string line = output.Line(event);
     if (!line.empty()) {
-      PrintLine(line);
+      stdoutLines.Write(line, outputStop);
     }
   };
+
   veltpeer::Peer peer(options);
   const veltpeer::Peer::Started started = peer.Start();
   if (!started.Ok()) {
@@ -81,9 +101,15 @@ int main(int argc, char** argv) {
     return kRuntimeError;
   }
   WaitForEnd(peer, signals);
+  peer.RequestStop();
+  if (!peer.WaitFinished(kOutputGrace)) {
+    outputStop.Raise();
+  }
   peer.Stop();
   if (commandLine.CountOnly()) {
-    PrintLine(veltpeer::PeerOutput::TotalsLine(peer.Totals()));
+    const veltpeer::StopSignal noStop;
+    stdoutLines.Write(veltpeer::PeerOutput::TotalsLine(peer.Totals()), noStop,
+                      veltpeer::StopSignal::Clock::now() + kOutputGrace);
   }
   const std::string failure = peer.Failure();
   if (!failure.empty()) {

@@ -6,6 +6,7 @@
 #include <optional>
 #include <regex>
 #include <string>
+#include <thread>
 
 #include "LoopbackTcpClient.h"
 #include "LoopbackUdpSocket.h"
@@ -119,6 +120,18 @@ TEST(PeerProgram, UdpEchoPrintsTextLinesAndEndsAtTheExitLimit) {
   EXPECT_EQ(process.ReadLine(kTimeout), std::optional<std::string>("rx hi\\x01"));
   EXPECT_EQ(process.ReadLine(kTimeout), std::optional<std::string>("tx hi\\x01"));
   EXPECT_EQ(process.ReadLine(kTimeout), std::nullopt);
+}
+
+TEST(PeerProgram, SigtermEndsTheRunEvenWhenNobodyReadsTheOutput) {
+  LoopbackUdpSocket sink;
+  ASSERT_TRUE(sink.Bound());
+  PeerProcess process({"udp", "--to", "127.0.0.1:" + std::to_string(sink.Port()), "--emit",
+                       "forever", "--rate", "0"});
+  ASSERT_NE(AnnouncedPort(process, "velt-peer: bound udp"), 0);
+  // One tx line per datagram fills the unread output pipe within moments.
+  std::this_thread::sleep_for(milliseconds(200));
+  process.Signal(SIGTERM);
+  EXPECT_EQ(process.Wait(kTimeout), std::optional<int>(0));
 }
 
 TEST(PeerProgram, MaxSecondsEndsTheRun) {

@@ -104,14 +104,17 @@ TEST(PeerTcp, EmitsExactlyNFramedTokens) {
 TEST(PeerTcp, EmitsAtTheGivenRate) {
   PeerOptions options = TcpOptions();
   options.emitCount = 3;
-  options.rate = 20;  // 50 ms apart
+  options.rate = 20;  // 50 ms apart, starting when the client is accepted
   options.payload = "{n}";
-  Session s(options);
-  ASSERT_TRUE(s.connected) << s.started.error;
-  EXPECT_EQ(s.client.Read(1, kTimeout), "1");
-  const auto first = std::chrono::steady_clock::now();
-  EXPECT_EQ(s.client.Read(2, kTimeout), "23");
-  EXPECT_GE(std::chrono::steady_clock::now() - first, milliseconds(80));
+  Peer peer(options);
+  const Peer::Started started = peer.Start();
+  ASSERT_TRUE(started.Ok()) << started.error;
+  const auto begin = std::chrono::steady_clock::now();
+  LoopbackTcpClient client;
+  ASSERT_TRUE(client.Connect(started.port));
+  EXPECT_EQ(client.Read(3, kTimeout), "123");
+  EXPECT_GE(std::chrono::steady_clock::now() - begin, milliseconds(100));
+  EXPECT_EQ(client.Read(1, kQuiet), "");
 }
 
 TEST(PeerTcp, SinkCountsFramesAndBytes) {
