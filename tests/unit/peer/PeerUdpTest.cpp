@@ -132,3 +132,20 @@ TEST(PeerUdp, ExitAfterStopsTakingDatagrams) {
   EXPECT_EQ(peer.Totals().framesReceived, 2U);
   EXPECT_EQ(peer.Failure(), "");
 }
+
+TEST(PeerUdp, LargeDatagramsEchoWhole) {
+  PeerOptions options = UdpOptions();
+  options.echo = true;
+  Peer peer(options);
+  const Peer::Started started = peer.Start();
+  ASSERT_TRUE(started.Ok()) << started.error;
+  LoopbackUdpSocket client;
+  for (const std::size_t size : {std::size_t{1536}, std::size_t{60000}}) {
+    std::string datagram(size, '\0');
+    for (std::size_t i = 0; i < size; ++i) {
+      datagram[i] = static_cast<char>(i % 251);
+    }
+    ASSERT_TRUE(client.SendTo(started.port, datagram));
+    EXPECT_EQ(client.Receive(kTimeout), std::optional<std::string>(datagram)) << size;
+  }
+}
