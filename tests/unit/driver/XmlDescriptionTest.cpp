@@ -4,12 +4,16 @@
 #include <zlib.h>
 
 #include <algorithm>
+#include <cstdio>
 #include <cstring>
 #include <map>
 #include <string>
 #include <vector>
 
 #include "MiniXml.h"
+#include "config/ParamManager.h"
+#include "driver/Protocol_VELT.h"
+#include "protlib/ProtUtilsN.h"
 
 namespace {
 
@@ -659,4 +663,149 @@ TEST_F(XmlDocument, EndsWithAnEmptyConversionsElement) {
   EXPECT_EQ(conversions.text(), "");
 }
 
+// ------------------------------------------- the description and the code
+
+// The description is checked against what the driver registers and parses,
+// read from the code itself, so the two cannot drift apart.
+class DescriptionAndCode : public XmlDocument {
+ protected:
+  static std::string Flag(bool value) { return value ? "true" : "false"; }
+  static std::string TypeName(ICU_Type type) {
+    return ProtUtilsN::GetTAVUName(type, ProtUtilsN::GetDataLength(type));
+  }
+  static std::string Hex(int mask) {
+    char text[16];
+    std::snprintf(text, sizeof text, "0x%x", static_cast<unsigned int>(mask));
+    return text;
+  }
+  static bool Parses(const std::string& extra) {
+    _VELT::ParamManager parameters;
+    return parameters.parse(
+        ("CfgVer=1 model=1 socketType=UDP remoteIpAddress=1.2.3.4 remotePort=1 " + extra).c_str());
+  }
+  const XmlElement& Parameter(const std::string& key) const {
+    const XmlElement* parameter = root().findByText("parameters/parameter", key);
+    EXPECT_NE(parameter, nullptr) << key;
+    return parameter == nullptr ? root() : *parameter;
+  }
+  Protocol_VELT protocol;
+};
+
+TEST_F(DescriptionAndCode, MemoryTypesAreTheRegisteredOnes) {
+  const Model* model = protocol.getMemoryManager().getModel("1");
+  ASSERT_NE(model, nullptr);
+  const std::vector<const XmlElement*> described = root().findAll("memtypes/memtype");
+  const std::vector<MemoryType>& registered = model->getMemoryTypes();
+  ASSERT_EQ(described.size(), registered.size());
+  for (std::size_t i = 0; i < registered.size(); ++i) {
+    const MemoryType& type = registered[i];
+    const XmlElement& element = *described[i];
+    SCOPED_TRACE(type.getName());
+    EXPECT_EQ(element.trimmedText(), type.getName());
+    EXPECT_EQ(element.attribute("naturalType"), TypeName(type.getNaturalType()));
+    EXPECT_EQ(element.attribute("tavuTypes"), Hex(type.getTavuTypes()));
+    EXPECT_EQ(element.attribute("min"), std::to_string(type.getMinIndex()));
+    EXPECT_EQ(element.attribute("max"), std::to_string(type.getMaxIndex()));
+    EXPECT_EQ(element.attribute("blockReadCount"), std::to_string(type.getBlockReadCount()));
+    EXPECT_EQ(element.attribute("blockWriteCount"), std::to_string(type.getBlockWriteCount()));
+    EXPECT_EQ(element.attribute("isReadOnly"), Flag(type.isReadOnly()));
+    EXPECT_EQ(element.attribute("isWriteOnly"), Flag(type.isWriteOnly()));
+    EXPECT_EQ(element.attribute("canBitWrite"), Flag(type.canBitWrite()));
+    EXPECT_EQ(element.attribute("mustBitRead"), Flag(type.mustBitRead()));
+    EXPECT_EQ(element.attribute("canBitArrayWrite"), Flag(type.canBitArrayWrite()));
+    EXPECT_EQ(element.attribute("isSwap2"), Flag(type.isSwap2()));
+    EXPECT_EQ(element.attribute("isSwap4"), Flag(type.isSwap4()));
+    EXPECT_EQ(element.attribute("isSwap8"), Flag(type.isSwap8()));
+    EXPECT_EQ(element.attribute("hasInternalConversion"), Flag(type.hasInternalConversion()));
+    EXPECT_EQ(element.attribute("useInDatagram"), Flag(type.useInDatagram()));
+  }
+}
+
+TEST_F(DescriptionAndCode, ModelIsTheRegisteredOne) {
+  const Model* model = protocol.getMemoryManager().getModel("1");
+  ASSERT_NE(model, nullptr);
+  const XmlElement* element = root().find("models/model");
+  ASSERT_NE(element, nullptr);
+  EXPECT_EQ(element->trimmedText(), model->getName());
+  EXPECT_EQ(element->attribute("datagramCount"), std::to_string(model->getMaxDatagramItems()));
+  EXPECT_EQ(element->attribute("datagramLength"), std::to_string(model->getMaxDatagramLength()));
+  const std::vector<const XmlElement*> references = element->findAll("memtype_ref");
+  EXPECT_EQ(references.size(), model->getMemoryTypes().size());
+  for (const XmlElement* reference : references) {
+    const MemoryType* type =
+        protocol.getMemoryManager().getMemoryType(model->getName(), reference->trimmedText());
+    ASSERT_NE(type, nullptr) << reference->trimmedText();
+    EXPECT_EQ(reference->attribute("min"), std::to_string(type->getMinIndex()));
+    EXPECT_EQ(reference->attribute("max"), std::to_string(type->getMaxIndex()));
+  }
+}
+
+TEST_F(DescriptionAndCode, IdentityIsTheDriversOwn) {
+  EXPECT_EQ(root().find("name")->trimmedText(), protocol.GetName());
+  EXPECT_EQ(root().find("display")->trimmedText(), protocol.GetProtocolName());
+  EXPECT_EQ(root().find("code")->trimmedText(), std::to_string(protocol.GetProtocolType()));
+  const std::string version = "Version=" + std::to_string(protocol.GetProtocolVersion()) + "?";
+  EXPECT_NE(kHeader.find(version), std::string::npos);
+  EXPECT_EQ(protocol.GetXml(), GetXml_VELT());
+}
+
+TEST_F(DescriptionAndCode, AddressFieldsAreTheDriversOwn) {
+  const char* const* names = protocol.tagUriNames();
+  const std::vector<const XmlElement*> fields = root().findAll("tag_uri/tag_field");
+  std::vector<std::string> fromCode;
+  for (; *names != nullptr; ++names) {
+    fromCode.push_back(*names);
+  }
+  EXPECT_EQ(Texts(fields), fromCode);
+}
+
+TEST_F(DescriptionAndCode, OptionalParameterDefaultsAreTheParsersOwn) {
+  _VELT::ParamManager parameters;
+  ASSERT_TRUE(
+      parameters.parse("CfgVer=1 model=1 socketType=UDP remoteIpAddress=1.2.3.4 remotePort=1"));
+  const _VELT::CommonParams& common = *parameters.getCommonParams();
+  EXPECT_EQ(Parameter("localIpAddress").attribute("default"), common.localIpAddress);
+  EXPECT_EQ(Parameter("localPort").attribute("default"), std::to_string(common.localPort));
+  EXPECT_EQ(Parameter("broadcastType").attribute("default"), common.broadcastType);
+  EXPECT_EQ(Parameter("rx_prefix").attribute("default"), common.rx_prefix);
+  EXPECT_EQ(Parameter("rx_suffix").attribute("default"), common.rx_suffix);
+  EXPECT_EQ(Parameter("gap").attribute("default"), std::to_string(common.gap));
+  EXPECT_EQ(Parameter("tx_prefix").attribute("default"), common.tx_prefix);
+  EXPECT_EQ(Parameter("tx_suffix").attribute("default"), common.tx_suffix);
+  EXPECT_EQ(Parameter("hex_tokens").attribute("default"), Flag(common.hex_tokens));
+  EXPECT_EQ(Parameter("token_queue_size").attribute("default"),
+            std::to_string(common.token_queue_size));
+  EXPECT_EQ(Parameter("model").attribute("default"), parameters.getNodeParams(0)->model);
+}
+
+TEST_F(DescriptionAndCode, RangesAreTheParsersOwn) {
+  const XmlElement& queue = Parameter("token_queue_size");
+  const int low = std::stoi(*queue.attribute("min"));
+  const int high = std::stoi(*queue.attribute("max"));
+  EXPECT_TRUE(Parses("token_queue_size=" + std::to_string(low)));
+  EXPECT_TRUE(Parses("token_queue_size=" + std::to_string(high)));
+  EXPECT_FALSE(Parses("token_queue_size=" + std::to_string(low - 1)));
+  EXPECT_FALSE(Parses("token_queue_size=" + std::to_string(high + 1)));
+  const XmlElement& port = Parameter("remotePort");
+  const int portHigh = std::stoi(*port.attribute("max"));
+  EXPECT_EQ(*port.attribute("min"), "0");
+  _VELT::ParamManager parameters;
+  EXPECT_TRUE(parameters.parse(("CfgVer=1 model=1 socketType=UDP remoteIpAddress=1.2.3.4 "
+                                "remotePort=" +
+                                std::to_string(portHigh))
+                                   .c_str()));
+  EXPECT_FALSE(parameters.parse(("CfgVer=1 model=1 socketType=UDP remoteIpAddress=1.2.3.4 "
+                                 "remotePort=" +
+                                 std::to_string(portHigh + 1))
+                                    .c_str()));
+  EXPECT_FALSE(
+      parameters.parse("CfgVer=1 model=1 socketType=UDP remoteIpAddress=1.2.3.4 remotePort=-1"));
+}
+
+TEST_F(DescriptionAndCode, SocketTypesListedAreTheOnesTheDriverAccepts) {
+  const std::vector<const XmlElement*> entries = Parameter("socketType").findAll("list_entry");
+  ASSERT_EQ(Texts(entries), (std::vector<std::string>{"UDP", "TCP"}));
+  const std::vector<const XmlElement*> broadcast = Parameter("broadcastType").findAll("list_entry");
+  ASSERT_EQ(Texts(broadcast), (std::vector<std::string>{"Global", "Local"}));
+}
 }  // namespace
