@@ -100,11 +100,9 @@ int ProtocolBase::GetLastError() const {
 }
 
 const char* ProtocolBase::GetLastErrorString() const {
-  thread_local std::string copy;
-  {
-    const std::lock_guard<std::mutex> hold(stateLock);
-    copy = lastErrorText;
-  }
+  const std::lock_guard<std::mutex> hold(stateLock);
+  std::string& copy = errorCopies[std::this_thread::get_id()];
+  copy = lastErrorText;
   return copy.c_str();
 }
 

@@ -2,8 +2,10 @@
 
 #include <cstdint>
 #include <list>
+#include <map>
 #include <mutex>
 #include <string>
+#include <thread>
 
 #include "IProtocol7.h"
 #include "ITag.h"
@@ -88,8 +90,9 @@ class ProtocolBase : public IProtocol7 {
   // GetName().
   const char* GetNextInstanceName() const override;
   int GetLastError() const override;
-  // A copy of the last error text, owned by the calling thread: the pointer
-  // stays valid and unchanged until the same thread calls this again.
+  // A copy of the last error text kept for the calling thread: the pointer
+  // stays valid and unchanged until the same thread calls this again on this
+  // protocol, or the protocol is deleted.
   const char* GetLastErrorString() const override;
   // The information text (see BaseConsole); returns the characters written,
   // without a terminator.
@@ -240,5 +243,10 @@ class ProtocolBase : public IProtocol7 {
   std::list<ITag*> tagList;
   std::int32_t lastErrorCode = 1;
   std::string lastErrorText;
+  // The copies GetLastErrorString handed out, one per calling thread. They
+  // live in the protocol rather than in thread-local storage: a thread-local
+  // object with a destructor would keep the plug-in loaded until its thread
+  // ends, so a host could not unload it.
+  mutable std::map<std::thread::id, std::string> errorCopies;
   std::string identText;
 };

@@ -111,3 +111,25 @@ TEST(PluginLoad, OnlyTheEntryPointIsVisible) {
   EXPECT_EQ(plugin.Symbol("piMultiTask"), nullptr);
   EXPECT_EQ(plugin.Symbol("_Z16CompareInterfacePKcS0_"), nullptr);
 }
+
+TEST(PluginLoad, UnloadsAfterTheLastErrorWasReadOnThisThread) {
+  {
+    Plugin plugin;
+    ASSERT_TRUE(plugin.Loaded()) << dlerror();
+    IInterfaceFactory* const factory = plugin.Entry()();
+    auto* const module = static_cast<IProtModule*>(factory->CreateInterface("IProtModule"));
+    RecordingHostFactory host;
+    ASSERT_EQ(module->Init(&host), 1);
+    auto* const protocols =
+        static_cast<IProtocolFactory*>(factory->CreateInterface("IProtocolFactory"));
+    IProtocol* const channel = protocols->CreateProtocol("VELT");
+    ASSERT_NE(channel, nullptr);
+    EXPECT_FALSE(channel->Config("no section"));
+    EXPECT_STREQ(channel->GetLastErrorString(), "Parser: unknown format");
+    protocols->DeleteProtocol(channel);
+    module->Close();
+    ASSERT_EQ(plugin.Unload(), 0);
+  }
+  // Nothing of the plug-in stays behind in this thread: the library is gone.
+  EXPECT_EQ(dlopen(VELT_PLUGIN_PATH, RTLD_NOW | RTLD_NOLOAD), nullptr);
+}

@@ -14,6 +14,13 @@ using Bytes = std::vector<unsigned char>;
 
 // A TCP socket listening on 127.0.0.1 at a port the system picks.
 FileDescriptor Listen(int backlog, std::uint16_t& port);
+// A listener on the given loopback port (address reuse on, so the port of a
+// listener closed a moment ago can be taken again).
+FileDescriptor ListenOn(int backlog, std::uint16_t port);
+// A listener on a free port below the kernel's ephemeral range, returned in
+// port: no socket bound to port 0 can take that port while the listener is
+// closed.
+FileDescriptor ListenBelowEphemeral(int backlog, std::uint16_t& port);
 // The next connection on a listening socket; invalid after the time-out.
 FileDescriptor Accept(int listener, std::chrono::milliseconds timeout);
 // A blocking TCP connection to 127.0.0.1:port; invalid on failure.

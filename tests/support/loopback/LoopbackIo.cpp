@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <stdexcept>
+#include <string>
 
 namespace LoopbackIo {
 namespace {
@@ -53,6 +54,33 @@ FileDescriptor Listen(int backlog, std::uint16_t& port) {
     throw std::runtime_error("cannot listen on loopback");
   }
   return fd;
+}
+
+FileDescriptor ListenOn(int backlog, std::uint16_t port) {
+  FileDescriptor fd(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
+  const int on = 1;
+  const sockaddr_in local = Address(INADDR_LOOPBACK, port);
+  if (!fd.Valid() || ::setsockopt(fd.Get(), SOL_SOCKET, SO_REUSEADDR, &on, sizeof on) != 0 ||
+      ::bind(fd.Get(), Raw(local), sizeof local) != 0 || ::listen(fd.Get(), backlog) != 0) {
+    throw std::runtime_error("cannot listen on loopback port " + std::to_string(port));
+  }
+  return fd;
+}
+
+FileDescriptor ListenBelowEphemeral(int backlog, std::uint16_t& port) {
+  // Ports below the kernel's ephemeral range are never handed to a socket
+  // bound to port 0, so a listener there can go away and come back without
+  // another socket taking its port in between.
+  const auto start = static_cast<std::uint16_t>(20000 + ::getpid() % 10000);
+  for (std::uint16_t candidate = start; candidate < 32000; ++candidate) {
+    try {
+      FileDescriptor fd = ListenOn(backlog, candidate);
+      port = candidate;
+      return fd;
+    } catch (const std::runtime_error&) {
+    }
+  }
+  throw std::runtime_error("no free loopback port below the ephemeral range");
 }
 
 FileDescriptor Accept(int listener, std::chrono::milliseconds timeout) {
