@@ -117,3 +117,36 @@ TEST_F(ChannelStress, WorkerReadersWritersAndAppliesRunTogether) {
   EXPECT_LE(std::stoi(Console("tokens_available")), bound);
   EXPECT_EQ(ReadInt("?SP_Gap?unsignedInt"), 20 + (kSends - 1) % 7);
 }
+
+TEST_F(ChannelStress, SendsNeverReachASocketBeingReplaced) {
+  // One thread sends without pause while another switches the connection
+  // off and on, so the worker deletes and re-creates the socket again and
+  // again; every send must either reach a live socket or find none.
+  std::uint16_t peerPort = 0;
+  const FileDescriptor peer = LoopbackIo::BindUdp(0x7F000001U, peerPort);
+  Open("CfgVer=1 model=1 socketType=UDP remoteIpAddress=127.0.0.1 remotePort=" +
+       std::to_string(peerPort));
+  ITag* const connect = Tag("?connect?boolean");
+  ITag* const tx = Tag("?tx_token?string-8");
+  std::atomic<bool> running{true};
+  std::atomic<int> failures{0};
+  std::thread sender([&] {
+    unsigned char text[9] = "ping";
+    while (running.load()) {
+      if (!channel->Write(tx, text)) {
+        ++failures;
+      }
+    }
+  });
+  std::thread toggler([&] {
+    for (int i = 0; i < 200; ++i) {
+      const unsigned char state = i % 2 == 0 ? 1 : 0;
+      channel->Write(connect, &state);
+      std::this_thread::sleep_for(2ms);
+    }
+    running = false;
+  });
+  toggler.join();
+  sender.join();
+  EXPECT_EQ(failures.load(), 0);
+}

@@ -80,6 +80,9 @@ ITask* FakeMultiTask::CreateTask(ITaskRunner* runner, int setting) {
 }
 
 int FakeMultiTask::StartTask(ITask* task) {
+  if (onStart_) {
+    onStart_();
+  }
   if (threads_.load()) {
     static_cast<Task*>(task)->Start();
   }

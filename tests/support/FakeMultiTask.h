@@ -1,6 +1,7 @@
 #pragma once
 
 #include <atomic>
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <string>
@@ -37,6 +38,9 @@ class FakeMultiTask final : public IMultiTask2 {
   void RunTasksOnThreads(bool on) { threads_ = on; }
   // The next count DeleteTask calls answer 0 (task still running).
   void DeleteTaskFailures(int count) { deleteFailures_ = count; }
+  // Called by StartTask before the task runs, to observe what the task would
+  // see first.
+  void OnStartTask(std::function<void()> hook) { onStart_ = std::move(hook); }
 
   // Records.
   int LiveMutexes() const;
@@ -65,4 +69,5 @@ class FakeMultiTask final : public IMultiTask2 {
   int tasksCreated_ = 0;
   int lastSetting_ = -1;
   ITaskRunner* lastRunner_ = nullptr;
+  std::function<void()> onStart_;
 };

@@ -166,6 +166,20 @@ TEST_F(ProtocolLifecycleTest, RestartMakesANewWorkerAndWaitsForConnect) {
   EXPECT_TRUE(Sock().Connects().empty());
 }
 
+TEST_F(ProtocolLifecycleTest, FlagsAreClearedBeforeTheNewWorkerStarts) {
+  Protocol_VELT& p = Connected(kUdpConfig);
+  p.Stop();
+  bool requested = true;
+  bool connectedAtStart = true;
+  tasks.OnStartTask([&] {
+    requested = p.isConnectRequested();
+    connectedAtStart = p.isConnected();
+  });
+  p.Start();
+  EXPECT_FALSE(requested);
+  EXPECT_FALSE(connectedAtStart);
+}
+
 TEST_F(ProtocolLifecycleTest, LowerCaseTcpGivesAUdpSocket) {
   Started("CfgVer=1 model=1 socketType=tcp remoteIpAddress=127.0.0.1 remotePort=1");
   EXPECT_EQ(sockets.Log(), Log{"create 0 0 0 -> #1"});

@@ -242,6 +242,15 @@ TEST_F(ReadWriteTest, WritingPastTheLargestIndexIsRefused) {
   EXPECT_TRUE(WriteText(Tag("?SP_RemoteIP?string-9999"), "1.2.3.4"));
 }
 
+TEST_F(ReadWriteTest, WritesNeverReadTheOldValueFirst) {
+  // Reading these tags would fail (their values do not fit), so a write that
+  // read the old value before writing would fail too.
+  Started(kUdpConfig);
+  EXPECT_TRUE(WriteText(Tag("?SP_RemoteIP?string-4"), "1.2"));
+  EXPECT_TRUE(WriteText(Tag("?SP_SocketType?string-3"), "TCP"));
+  EXPECT_TRUE(WriteText(Tag("?SP_BroadcastType?string-6"), "Local"));
+}
+
 TEST_F(ReadWriteTest, StagingValidatesTheValue) {
   Started(kUdpConfig);
   EXPECT_FALSE(WriteText(Tag("?SP_SocketType?string-4"), "udp"));

@@ -130,6 +130,19 @@ TEST_F(WorkerTest, UdpMarkerMadeOfAZeroByteCountsAsEmpty) {
   EXPECT_EQ(Drain(), Tokens{Bytes("410042")});
 }
 
+TEST_F(WorkerTest, UdpFullDatagramIsSearchedWithinItsOwnBytes) {
+  // A datagram that fills the buffer has no terminator after it: every
+  // search stays inside the received bytes.
+  Connected(WithMarkers(kUdpConfig, "0241", "0342"));
+  std::string datagram(1534, 'x');
+  datagram += Bytes("0241");
+  Sock().AddDatagram(datagram);
+  std::string framed = Bytes("0241") + std::string(1529, 'y') + Bytes("03");
+  Sock().AddDatagram(framed);
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{});
+}
+
 TEST_F(WorkerTest, UdpSuffixOnlyCutsSeveralTokens) {
   Connected(WithMarkers(kUdpConfig, "", "0D0A"));
   Sock().AddDatagram(Bytes("41420D0A43440D0A"));
