@@ -106,6 +106,16 @@ void BaseConsole::getMaxTm(char* out, int outSize) {
   CopyReply(out, outSize, reply);
 }
 
+BaseConsole::TemporaryTag BaseConsole::createTag(const std::string& uri, char* out, int outSize) {
+  TemporaryTag tag(protocol.CreateTag(uri.c_str()), TagRelease{&protocol});
+  if (tag == nullptr) {
+    CopyReply(out, outSize, protocol.GetLastErrorString());
+  }
+  return tag;
+}
+
+void BaseConsole::TagRelease::operator()(ITag* tag) const { owner->FreeTag(tag); }
+
 // The value goes directly into out as two lower-case digits per byte; before
 // each byte the room left is tested, and the digits stop when 4 or fewer
 // characters remain. The line feed and the terminator follow as far as the
@@ -115,10 +125,8 @@ void BaseConsole::read(const std::vector<std::string>& words, char* out, int out
     CopyReply(out, outSize, "error: missing parameter (URI string)\n");
     return;
   }
-  const auto release = [this](ITag* tag) { protocol.FreeTag(tag); };
-  const std::unique_ptr<ITag, decltype(release)> tag(protocol.CreateTag(words[1].c_str()), release);
+  const TemporaryTag tag = createTag(words[1], out, outSize);
   if (tag == nullptr) {
-    CopyReply(out, outSize, protocol.GetLastErrorString());
     return;
   }
   ScratchBuffer<kValueBytes> value(tag->GetVarLength());
@@ -145,10 +153,8 @@ void BaseConsole::write(const std::vector<std::string>& words, char* out, int ou
     CopyReply(out, outSize, "error: missing parameters (URI string + data)\n");
     return;
   }
-  const auto release = [this](ITag* tag) { protocol.FreeTag(tag); };
-  const std::unique_ptr<ITag, decltype(release)> tag(protocol.CreateTag(words[1].c_str()), release);
+  const TemporaryTag tag = createTag(words[1], out, outSize);
   if (tag == nullptr) {
-    CopyReply(out, outSize, protocol.GetLastErrorString());
     return;
   }
   const std::string& data = words[2];

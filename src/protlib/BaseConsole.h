@@ -1,8 +1,10 @@
 #pragma once
 
+#include <memory>
 #include <string>
 #include <vector>
 
+class ITag;
 class ProtocolBase;
 
 // The commands that every protocol answers at the host's diagnostic console:
@@ -35,6 +37,16 @@ class BaseConsole {
   static void CopyReply(char* out, int outSize, const char* text);
 
  private:
+  // Frees a command's temporary tag through the protocol.
+  struct TagRelease {
+    ProtocolBase* owner;
+    void operator()(ITag* tag) const;
+  };
+  using TemporaryTag = std::unique_ptr<ITag, TagRelease>;
+
+  // The tag a command addresses; null, with the last error as the reply,
+  // when the address is refused. The tag never outlives the command.
+  TemporaryTag createTag(const std::string& uri, char* out, int outSize);
   void info(char* out, int outSize) const;
   void read(const std::vector<std::string>& words, char* out, int outSize);
   void write(const std::vector<std::string>& words, char* out, int outSize);
