@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <limits>
 #include <system_error>
 #include <utility>
 
@@ -96,9 +97,12 @@ HostSocket::WaitResult HostSocket::WaitFor(int fd, short events, Clock::time_poi
   const int stopFd = HostTask::CurrentStopDescriptor();
   pollfd fds[2] = {{fd, events, 0}, {stopFd, POLLIN, 0}};
   const nfds_t count = stopFd >= 0 ? 2 : 1;
+  const bool unlimited = deadline == Clock::time_point::max();
   for (;;) {
     const auto left = std::chrono::ceil<std::chrono::milliseconds>(deadline - Clock::now());
-    const int timeout = static_cast<int>(std::max<std::chrono::milliseconds::rep>(left.count(), 0));
+    const int timeout = unlimited ? -1
+                                  : static_cast<int>(std::clamp<std::chrono::milliseconds::rep>(
+                                        left.count(), 0, std::numeric_limits<int>::max()));
     const int rc = ::poll(fds, count, timeout);
     if (rc < 0) {
       if (errno == EINTR) {
@@ -226,8 +230,11 @@ int HostSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMillise
   if (buffer == nullptr || maxLength <= 0) {
     return -1;
   }
+  // A negative time-out waits without limit (a stop request still ends the
+  // wait), so a channel whose gap is negative idles instead of spinning.
   const Clock::time_point deadline =
-      Clock::now() + std::chrono::milliseconds(std::max(timeoutMilliseconds, 0));
+      timeoutMilliseconds < 0 ? Clock::time_point::max()
+                              : Clock::now() + std::chrono::milliseconds(timeoutMilliseconds);
   const std::lock_guard<std::mutex> lock(receiveMutex_);
   return tcp_ ? ReceiveTcp(buffer, maxLength, deadline) : ReceiveUdp(buffer, maxLength, deadline);
 }

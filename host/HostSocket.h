@@ -65,8 +65,9 @@ class HostSocket final : public ISocket {
   int IsBroken() override;
   // Bytes received (at most maxLength); 0 when the time-out elapsed or the
   // calling task was asked to stop; -1 on an error, a closed or absent TCP
-  // connection, or a bad argument. A time-out of 0 or less only takes what
-  // is already there.
+  // connection, or a bad argument. A time-out of 0 only takes what is
+  // already there; a negative one waits without limit (until data, an error
+  // or a stop request).
   int Receive(unsigned char* buffer, int maxLength, int timeoutMilliseconds) override;
   // As AdapterLookup::Find; null out-pointers are skipped. 1 on success.
   int GetAdapterInfo(unsigned int ip, unsigned int* address, unsigned int* mask,

@@ -283,6 +283,7 @@ bool Protocol_VELT::initSocket(const ChannelSettings& current) {
     factory->DeleteSocket(old, 0);
   }
   localBroadcastAddress = "255.255.255.255";
+  socketSettingsUnusable.store(false);
   if (factory == nullptr) {
     return false;
   }
@@ -299,6 +300,7 @@ bool Protocol_VELT::initSocket(const ChannelSettings& current) {
     if (!parseIpAddress(address.c_str(), ip)) {
       // The probe is deliberately left to the host here: it is never used
       // again.
+      socketSettingsUnusable.store(true);
       SetError(-6, "Incorrect format of IP address");
       return false;
     }
@@ -431,6 +433,12 @@ bool Protocol_VELT::connect() {
   const bool toSubnet =
       workerSettings.broadcastType == "Local" && workerSettings.remoteIp == "255.255.255.255";
   const std::string& target = toSubnet ? localBroadcastAddress : workerSettings.remoteIp;
+  if (sock == nullptr && socketSettingsUnusable.load()) {
+    // Making the socket again cannot succeed before the settings change,
+    // and each attempt would leave another probe socket behind.
+    sleep(kIdleSleep);
+    return false;
+  }
   // Without a socket the attempt counts as failed, so the socket is made
   // again after the usual number of attempts.
   const int result =

@@ -140,6 +140,10 @@ class Protocol_VELT final : public ProtocolBase {
   std::atomic<bool> connected{false};
   std::atomic<bool> connectRequested{false};
 
+  // Set when the socket could not be made because the local address is not
+  // an address: retrying cannot help until the settings change.
+  std::atomic<bool> socketSettingsUnusable{false};
+
   // The worker's own state.
   std::string lastRemoteIp;
   int lastRemotePort = 0;

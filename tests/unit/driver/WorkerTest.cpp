@@ -432,6 +432,20 @@ TEST_F(WorkerTest, FailedSocketCreationIsRetriedAfterTheFailedConnects) {
   EXPECT_TRUE(protocol->isConnected());
 }
 
+TEST_F(WorkerTest, UnreadableLocalAddressIsNotRetriedUntilTheSettingsChange) {
+  Started(
+      "CfgVer=1 model=1 socketType=UDP remoteIpAddress=1.2.3.4 remotePort=1 broadcastType=Local "
+      "localIpAddress=10.0.0");
+  Pass();
+  Command("connect ON");
+  Pass(300);
+  // One probe each from the start and the first pass, none from retries.
+  EXPECT_EQ(sockets.Log(), (std::vector<std::string>{"create 0 0 0 -> #1", "create 0 0 0 -> #2"}));
+  Command("set_ip_port 1.2.3.5 1");
+  Pass();
+  EXPECT_EQ(sockets.Log().size(), 3U);
+}
+
 TEST_F(WorkerTest, ReceiveErrorEndsThePassLikeATimeout) {
   Connected(kUdpConfig);
   Sock().AddError();

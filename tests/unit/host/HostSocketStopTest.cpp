@@ -78,6 +78,26 @@ TEST(HostSocketStop, StopInterruptsABlockedTcpReceive) {
   EXPECT_EQ(socket->IsBroken(), 0);
 }
 
+TEST(HostSocketStop, StopInterruptsAReceiveWithoutTimeLimit) {
+  std::uint16_t port = 0;
+  const FileDescriptor listener = LoopbackIo::Listen(8, port);
+  HostSocketFactory factory;
+  HostMultiTask tasks;
+  ISocket* const socket = factory.CreateSocket(0, 1, 0);
+  ASSERT_EQ(socket->Connect("127.0.0.1", port), 0);
+  const FileDescriptor peer = LoopbackIo::Accept(listener.Get(), milliseconds(2000));
+  std::atomic<int> result{-2};
+  const auto elapsed = StopWhileBlocked(
+      tasks,
+      [&] {
+        unsigned char byte = 0;
+        result = socket->Receive(&byte, 1, -1);
+      },
+      "tcp_receive_unlimited");
+  EXPECT_LT(elapsed, milliseconds(1000));
+  EXPECT_EQ(result.load(), 0);
+}
+
 TEST(HostSocketStop, StopInterruptsABlockedUdpReceive) {
   HostSocketFactory factory;
   HostMultiTask tasks;

@@ -145,7 +145,19 @@ TEST_F(ConnectedTcp, ReceiveHonoursItsTimeout) {
 TEST_F(ConnectedTcp, ReceiveWithZeroTimeoutOnlyTakesWhatIsThere) {
   unsigned char byte = 0;
   EXPECT_EQ(socket_->Receive(&byte, 1, 0), 0);
-  EXPECT_EQ(socket_->Receive(&byte, 1, -10), 0);
+}
+
+TEST_F(ConnectedTcp, ReceiveWithANegativeTimeoutWaitsForData) {
+  std::thread late([this] {
+    std::this_thread::sleep_for(milliseconds(150));
+    LoopbackIo::SendAll(peer_.Get(), LoopbackIo::FromText("z"));
+  });
+  unsigned char byte = 0;
+  const auto start = Clock::now();
+  EXPECT_EQ(socket_->Receive(&byte, 1, -1), 1);
+  EXPECT_GE(Clock::now() - start, milliseconds(150));
+  EXPECT_EQ(byte, 'z');
+  late.join();
 }
 
 TEST_F(ConnectedTcp, ReceiveRefusesBadArguments) {
