@@ -148,12 +148,12 @@ TEST_F(ConnectedTcp, ReceiveWithZeroTimeoutOnlyTakesWhatIsThere) {
 }
 
 TEST_F(ConnectedTcp, ReceiveWithANegativeTimeoutWaitsForData) {
+  const auto start = Clock::now();
   std::thread late([this] {
     std::this_thread::sleep_for(milliseconds(150));
     LoopbackIo::SendAll(peer_.Get(), LoopbackIo::FromText("z"));
   });
   unsigned char byte = 0;
-  const auto start = Clock::now();
   EXPECT_EQ(socket_->Receive(&byte, 1, -1), 1);
   EXPECT_GE(Clock::now() - start, milliseconds(150));
   EXPECT_EQ(byte, 'z');
