@@ -1,8 +1,4 @@
-#include <arpa/inet.h>
 #include <gtest/gtest.h>
-#include <netinet/in.h>
-#include <sys/socket.h>
-#include <unistd.h>
 
 #include <chrono>
 #include <cstdint>
@@ -12,7 +8,7 @@
 #include <vector>
 
 #include "ChildProcess.h"
-#include "velt-peer/FileDescriptor.h"
+#include "LoopbackUdp.h"
 #include "velt-peer/Peer.h"
 
 // The example host (examples/minimal-host) run as a program against an
@@ -56,21 +52,6 @@ veltpeer::PeerOptions TcpEmitter(std::uint64_t count, const std::string& payload
 std::string TcpConfig(std::uint16_t port) {
   return "CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.1 remotePort=" +
          std::to_string(port) + " rx_prefix=02 rx_suffix=03";
-}
-
-// A UDP port that was free a moment ago.
-std::uint16_t FreeUdpPort() {
-  const veltpeer::FileDescriptor probe(::socket(AF_INET, SOCK_DGRAM, 0));
-  sockaddr_in address{};
-  address.sin_family = AF_INET;
-  address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-  socklen_t size = sizeof address;
-  if (!probe.Valid() ||
-      ::bind(probe.Get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0 ||
-      ::getsockname(probe.Get(), reinterpret_cast<sockaddr*>(&address), &size) != 0) {
-    return 0;
-  }
-  return ntohs(address.sin_port);
 }
 
 const std::vector<std::string> kStartLines = {"loaded " VELT_PLUGIN_PATH, "module bound",
