@@ -27,13 +27,6 @@ std::string UdpConfig(std::uint16_t peer, std::uint16_t local, const std::string
          std::to_string(peer) + " localPort=" + std::to_string(local) + " " + extra;
 }
 
-// A UDP port that was free a moment ago.
-std::uint16_t FreeUdpPort() {
-  std::uint16_t port = 0;
-  LoopbackIo::BindUdp(0x7F000001U, port);
-  return port;
-}
-
 class ChannelOnHost : public HostedChannel {
  protected:
   // Opens a TCP channel to a loopback listener, connects it through the
@@ -127,7 +120,7 @@ TEST_F(ChannelOnHost, TxTokenArrivesByteForByte) {
 TEST_F(ChannelOnHost, UdpDatagramsBecomeTokensAfterConnect) {
   std::uint16_t peerPort = 0;
   const FileDescriptor peer = LoopbackIo::BindUdp(0x7F000001U, peerPort);
-  const std::uint16_t local = FreeUdpPort();
+  const std::uint16_t local = LoopbackIo::FreeUdpPort();
   Open(UdpConfig(peerPort, local, "rx_prefix=02 rx_suffix=03 tx_suffix=03"));
   EXPECT_TRUE(WriteBool("?connect?boolean", true));
   ASSERT_TRUE(WaitFor([&] { return ReadBool("?conn_stat?boolean"); }));
@@ -142,14 +135,14 @@ TEST_F(ChannelOnHost, UdpDatagramsBecomeTokensAfterConnect) {
 TEST_F(ChannelOnHost, AppliedLocalPortMovesTheSocket) {
   std::uint16_t peerPort = 0;
   const FileDescriptor peer = LoopbackIo::BindUdp(0x7F000001U, peerPort);
-  const std::uint16_t first = FreeUdpPort();
+  const std::uint16_t first = LoopbackIo::FreeUdpPort();
   Open(UdpConfig(peerPort, first));
   EXPECT_TRUE(WriteBool("?connect?boolean", true));
   ASSERT_TRUE(WaitFor([&] { return ReadBool("?conn_stat?boolean"); }));
   LoopbackIo::SendTo(peer.Get(), first, Raw("at first"));
   EXPECT_EQ(Tokens(1), std::vector<std::string>{"at first"});
 
-  const std::uint16_t second = FreeUdpPort();
+  const std::uint16_t second = LoopbackIo::FreeUdpPort();
   EXPECT_TRUE(WriteShort("?SP_LocalPort?unsignedShort", second));
   EXPECT_EQ(ReadShort("?SP_LocalPort?unsignedShort"), second);
   EXPECT_TRUE(WriteBool("?SP_Done?boolean", true));

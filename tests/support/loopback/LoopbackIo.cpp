@@ -111,6 +111,19 @@ FileDescriptor BindUdp(std::uint32_t address, std::uint16_t& port) {
 
 FileDescriptor ClosedTcpPort(std::uint16_t& port) { return BoundTcp(port); }
 
+std::uint16_t FreeUdpPort() {
+  std::uint16_t port = 0;
+  BindUdp(INADDR_LOOPBACK, port);
+  return port;
+}
+
+bool SendDatagram(std::uint16_t port, const std::string& bytes) {
+  const FileDescriptor sender(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+  const sockaddr_in peer = Address(INADDR_LOOPBACK, port);
+  return sender.Valid() && ::sendto(sender.Get(), bytes.data(), bytes.size(), 0, Raw(peer),
+                                    sizeof peer) == static_cast<ssize_t>(bytes.size());
+}
+
 std::uint16_t LocalPort(int fd) {
   sockaddr_in local{};
   socklen_t length = sizeof local;

@@ -30,6 +30,11 @@ FileDescriptor BindUdp(std::uint32_t address, std::uint16_t& port);
 // A port on which nothing listens: it stays bound (so nobody else takes
 // it) but never listens, so connects to it are refused.
 FileDescriptor ClosedTcpPort(std::uint16_t& port);
+// A loopback UDP port that was free a moment ago.
+std::uint16_t FreeUdpPort();
+// Sends one datagram to a loopback port from a socket of its own; true when
+// the whole datagram went out.
+bool SendDatagram(std::uint16_t port, const std::string& bytes);
 
 // The local port of a socket.
 std::uint16_t LocalPort(int fd);
