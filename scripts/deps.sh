@@ -4,7 +4,7 @@
 # prints the exact apt-get line to run.
 set -eu
 
-PACKAGES="cmake make g++ clang clang-format ninja-build zlib1g-dev libgtest-dev libgmock-dev"
+PACKAGES="cmake make g++ clang clang-format ninja-build pkg-config zlib1g-dev libedit-dev libgtest-dev libgmock-dev"
 
 if ! command -v dpkg-query >/dev/null 2>&1; then
   echo "deps: no dpkg-query here; assuming the tools and libraries are installed" >&2
