@@ -1,0 +1,46 @@
+#include "velt-host/KeyWatchEnd.h"
+
+#include <unistd.h>
+
+namespace velthost {
+
+KeyWatchEnd::KeyWatchEnd(int fd, StopSignals& signals) : fd_(fd), signals_(signals) {
+  if (::tcgetattr(fd_, &saved_) != 0) {
+    return;
+  }
+  termios keys = saved_;
+  keys.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO);
+  keys.c_cc[VMIN] = 1;
+  keys.c_cc[VTIME] = 0;
+  restore_ = ::tcsetattr(fd_, TCSANOW, &keys) == 0;
+}
+
+KeyWatchEnd::~KeyWatchEnd() {
+  if (restore_) {
+    ::tcsetattr(fd_, TCSANOW, &saved_);
+  }
+}
+
+WatchEnd::Event KeyWatchEnd::Wait(std::chrono::milliseconds timeout) {
+  if (ended_) {
+    return signals_.Wait(-1, timeout) == StopSignals::Event::kSignal ? Event::kSignal
+                                                                     : Event::kInputEnded;
+  }
+  const StopSignals::Event event = signals_.Wait(fd_, timeout);
+  if (event == StopSignals::Event::kSignal) {
+    return Event::kSignal;
+  }
+  if (event == StopSignals::Event::kTimeout) {
+    return Event::kNone;
+  }
+  char keys[64];
+  const ssize_t received = ::read(fd_, keys, sizeof keys);
+  if (received == 0) {
+    // The terminal hung up: no key can come any more.
+    ended_ = true;
+    return Event::kInputEnded;
+  }
+  return received > 0 ? Event::kKey : Event::kNone;
+}
+
+}  // namespace velthost

@@ -1,0 +1,33 @@
+#pragma once
+
+#include <termios.h>
+
+#include "velt-host/StopSignals.h"
+#include "velt-host/WatchEnd.h"
+
+namespace velthost {
+
+// Ends a .watch when a key is pressed on the terminal at fd: for its life
+// the terminal delivers single keys without echo (signals such as Ctrl-C
+// still work); the previous settings come back when it goes. The key itself
+// is taken and dropped.
+class KeyWatchEnd final : public WatchEnd {
+ public:
+  KeyWatchEnd(int fd, StopSignals& signals);
+  KeyWatchEnd(const KeyWatchEnd&) = delete;
+  KeyWatchEnd& operator=(const KeyWatchEnd&) = delete;
+  KeyWatchEnd(KeyWatchEnd&&) = delete;
+  KeyWatchEnd& operator=(KeyWatchEnd&&) = delete;
+  ~KeyWatchEnd() override;
+
+  Event Wait(std::chrono::milliseconds timeout) override;
+
+ private:
+  int fd_;
+  StopSignals& signals_;
+  termios saved_{};
+  bool restore_ = false;
+  bool ended_ = false;
+};
+
+}  // namespace velthost
