@@ -4,22 +4,7 @@
 
 namespace velthost {
 
-KeyWatchEnd::KeyWatchEnd(int fd, StopSignals& signals) : fd_(fd), signals_(signals) {
-  if (::tcgetattr(fd_, &saved_) != 0) {
-    return;
-  }
-  termios keys = saved_;
-  keys.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO);
-  keys.c_cc[VMIN] = 1;
-  keys.c_cc[VTIME] = 0;
-  restore_ = ::tcsetattr(fd_, TCSANOW, &keys) == 0;
-}
-
-KeyWatchEnd::~KeyWatchEnd() {
-  if (restore_) {
-    ::tcsetattr(fd_, TCSANOW, &saved_);
-  }
-}
+KeyWatchEnd::KeyWatchEnd(int fd, StopSignals& signals) : fd_(fd), signals_(signals), keys_(fd) {}
 
 WatchEnd::Event KeyWatchEnd::Wait(std::chrono::milliseconds timeout) {
   if (ended_) {

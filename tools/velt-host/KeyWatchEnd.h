@@ -1,7 +1,6 @@
 #pragma once
 
-#include <termios.h>
-
+#include "velt-host/SingleKeys.h"
 #include "velt-host/StopSignals.h"
 #include "velt-host/WatchEnd.h"
 
@@ -14,19 +13,12 @@ namespace velthost {
 class KeyWatchEnd final : public WatchEnd {
  public:
   KeyWatchEnd(int fd, StopSignals& signals);
-  KeyWatchEnd(const KeyWatchEnd&) = delete;
-  KeyWatchEnd& operator=(const KeyWatchEnd&) = delete;
-  KeyWatchEnd(KeyWatchEnd&&) = delete;
-  KeyWatchEnd& operator=(KeyWatchEnd&&) = delete;
-  ~KeyWatchEnd() override;
-
   Event Wait(std::chrono::milliseconds timeout) override;
 
  private:
   int fd_;
   StopSignals& signals_;
-  termios saved_{};
-  bool restore_ = false;
+  SingleKeys keys_;
   bool ended_ = false;
 };
 

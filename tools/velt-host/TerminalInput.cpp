@@ -9,6 +9,7 @@
 #include <utility>
 
 #include "velt-host/KeyWatchEnd.h"
+#include "velt-host/SingleKeys.h"
 
 namespace velthost {
 
@@ -98,7 +99,14 @@ bool TerminalInput::Next(std::string& line) {
     return false;
   }
   int count = 0;
-  const char* const text = el_gets(editor_.get(), &count);
+  const char* text = nullptr;
+  {
+    // The editor switches the terminal to single keys only once the prompt
+    // is out; a key typed in between would meet the line discipline instead
+    // (Ctrl-D would be lost). Switching before the prompt closes that gap.
+    const SingleKeys keys(STDIN_FILENO);
+    text = el_gets(editor_.get(), &count);
+  }
   if (text == nullptr || count <= 0 || signals_.Raised()) {
     // The shell's prompt starts on a line of its own after the console's.
     std::fputs("\n", stdout);
