@@ -3,6 +3,7 @@
 #include <signal.h>
 #include <unistd.h>
 
+#include <clocale>
 #include <cstdlib>
 #include <exception>
 #include <memory>
@@ -151,6 +152,13 @@ int HostProgram::PrintInfo(const std::string& pluginPath, ConsoleOutput& output)
 
 int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
                             ConsoleOutput& output) {
+  const bool terminal = ::isatty(STDIN_FILENO) == 1;
+  if (terminal) {
+    // The terminal's encoding, so that the line editor moves over whole
+    // characters. Set while this is the only thread: setlocale is not safe
+    // beside threads that use the locale.
+    std::setlocale(LC_CTYPE, "");
+  }
   const std::string pluginPath = PluginPath(options);
   const std::string storagePath = StoragePath(options);
   const std::vector<std::string> configs = ConfigStrings(options);
@@ -159,7 +167,6 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
     session.AddInstance(options.names[i], configs[i]);
   }
 
-  const bool terminal = ::isatty(STDIN_FILENO) == 1;
   const Console* console = nullptr;
   const auto prompt = [&console]() {
     return console == nullptr ? std::string() : console->Prompt();

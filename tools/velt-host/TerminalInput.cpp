@@ -4,7 +4,6 @@
 #include <unistd.h>
 
 #include <cerrno>
-#include <clocale>
 #include <cstdio>
 #include <utility>
 
@@ -70,8 +69,6 @@ int TerminalInput::ReadCharacter(editline* editor, wchar_t* character) {
 }
 
 bool TerminalInput::OpenEditor() {
-  // The terminal's encoding, so that the editor moves over whole characters.
-  std::setlocale(LC_CTYPE, "");
   history_.reset(history_init());
   if (history_ == nullptr) {
     return false;

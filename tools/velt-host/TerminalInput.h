@@ -18,6 +18,8 @@ namespace velthost {
 // is asked for before each line. The line editor is made on the first
 // line, so an object used only to watch for keys never touches the
 // terminal's line settings. A stop signal ends the current line at once.
+// Characters are decoded in the program's LC_CTYPE locale, which the
+// program sets from the environment before any thread starts.
 class TerminalInput final : public LineInput {
  public:
   // Lines kept in the history.
