@@ -45,7 +45,7 @@ bool ReadInto(int fd, std::string& text) {
 }  // namespace
 
 HostProcess::HostProcess(const std::vector<std::string>& arguments,
-                         const std::vector<std::string>& environment) {
+                         const std::vector<std::string>& environment, const char* program) {
   // A child that has exited closes its end of the input pipe; writing to it
   // then must fail rather than end the test program.
   ::signal(SIGPIPE, SIG_IGN);
@@ -74,7 +74,7 @@ HostProcess::HostProcess(const std::vector<std::string>& arguments,
   }
   ChildEnvironment childEnvironment(changes);
   std::vector<std::string> words;
-  words.emplace_back(VELT_HOST_PROGRAM);
+  words.emplace_back(program);
   words.insert(words.end(), arguments.begin(), arguments.end());
   std::vector<char*> argv;
   for (std::string& word : words) {
@@ -88,8 +88,7 @@ HostProcess::HostProcess(const std::vector<std::string>& arguments,
   posix_spawn_file_actions_adddup2(&actions, outWrite.Get(), STDOUT_FILENO);
   posix_spawn_file_actions_adddup2(&actions, errWrite.Get(), STDERR_FILENO);
   pid_t pid = -1;
-  if (posix_spawn(&pid, VELT_HOST_PROGRAM, &actions, nullptr, argv.data(),
-                  childEnvironment.Get()) == 0) {
+  if (posix_spawn(&pid, program, &actions, nullptr, argv.data(), childEnvironment.Get()) == 0) {
     pid_ = pid;
   }
   posix_spawn_file_actions_destroy(&actions);

@@ -10,9 +10,10 @@
 #include "ScratchFolder.h"
 #include "velt-peer/FileDescriptor.h"
 
-// The built velt-host run as a child process, its standard input, output and
-// error on pipes. Every wait has a deadline; a child that overruns one in
-// Wait, or still runs when the object goes, is killed.
+// The built velt-host (or another built program, such as velt-peer) run as a
+// child process, its standard input, output and error on pipes. Every wait
+// has a deadline; a child that overruns one in Wait, or still runs when the
+// object goes, is killed.
 class HostProcess {
  public:
   static constexpr std::chrono::milliseconds kTimeout{10000};
@@ -27,7 +28,8 @@ class HostProcess {
   // "-NAME"). XDG_STATE_HOME points into a scratch folder of the object's
   // own unless a change names it, so no run touches the real home.
   explicit HostProcess(const std::vector<std::string>& arguments,
-                       const std::vector<std::string>& environment = {});
+                       const std::vector<std::string>& environment = {},
+                       const char* program = VELT_HOST_PROGRAM);
   HostProcess(const HostProcess&) = delete;
   HostProcess& operator=(const HostProcess&) = delete;
   HostProcess(HostProcess&&) = delete;
