@@ -1,6 +1,7 @@
 #include "velt-host/Demo.h"
 
 #include <exception>
+#include <iterator>
 #include <thread>
 #include <utility>
 #include <vector>
@@ -20,7 +21,8 @@ constexpr const char* kGap = "?SP_Gap?unsignedInt";
 constexpr const char* kToken = "?rx_token?string-32";
 // velt-peer's own tokens, sent as soon as the driver connects.
 constexpr int kPeerTokens = 2;
-const std::vector<std::string> kSentTokens = {"hello", "velt conduit"};
+constexpr const char* kSentTokens[] = {"hello", "velt conduit"};
+constexpr int kSentCount = static_cast<int>(sizeof kSentTokens / sizeof kSentTokens[0]);
 constexpr const char* kUdpToken = "ping over udp";
 constexpr int kStagedGap = 250;
 
@@ -155,12 +157,12 @@ bool Demo::RunTcp(PluginSession& session, std::uint16_t port) {
     return false;
   }
   Say("send two tokens; velt-peer echoes them back");
-  for (const std::string& token : kSentTokens) {
-    if (!Step(".write ?tx_token?string-32 " + token)) {
+  for (const char* token : kSentTokens) {
+    if (!Step(std::string(".write ?tx_token?string-32 ") + token)) {
       return false;
     }
   }
-  const int total = kPeerTokens + static_cast<int>(kSentTokens.size());
+  const int total = kPeerTokens + kSentCount;
   if (!WaitFor(velt, kTokensAvailable, std::to_string(total), "echoes from velt-peer") ||
       !Step(std::string(".read ") + kTokensAvailable)) {
     return false;
@@ -174,7 +176,7 @@ bool Demo::DrainQueue(Instance& instance, int tokens) {
   for (int i = 1; i <= kPeerTokens; ++i) {
     expected.push_back("peer token " + std::to_string(i));
   }
-  expected.insert(expected.end(), kSentTokens.begin(), kSentTokens.end());
+  expected.insert(expected.end(), std::begin(kSentTokens), std::end(kSentTokens));
   for (int i = 0; i < tokens; ++i) {
     std::string token;
     std::string error;

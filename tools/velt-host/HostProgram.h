@@ -23,10 +23,10 @@ class HostProgram {
   int Run(const std::vector<std::string>& arguments);
 
  private:
-  int RunAction(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
-  int RunConsole(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
-  int PrintXml(const std::string& pluginPath, ConsoleOutput& output);
-  int PrintInfo(const std::string& pluginPath, ConsoleOutput& output);
+  static int RunAction(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
+  static int RunConsole(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
+  static int PrintXml(const std::string& pluginPath, ConsoleOutput& output);
+  static int PrintInfo(const std::string& pluginPath, ConsoleOutput& output);
   static std::string PluginPath(const HostOptions& options);
   static std::string StoragePath(const HostOptions& options);
   static std::vector<std::string> ConfigStrings(const HostOptions& options);

@@ -388,7 +388,8 @@ bool TypedValue::Parse(const ValueShape& shape, const std::string& text,
     const std::vector<std::string> words = Words(text);
     ok = itemBytes != 0 && words.size() == static_cast<std::size_t>(items);
     for (int i = 0; ok && i < items; ++i) {
-      ok = ParseScalar(item, words[static_cast<std::size_t>(i)], bytes.data() + i * itemBytes);
+      ok = ParseScalar(item, words[static_cast<std::size_t>(i)],
+                       bytes.data() + static_cast<std::ptrdiff_t>(i) * itemBytes);
     }
     expected = std::to_string(items) + (items == 1 ? " item" : " items") + " expected, " +
                (items == 1 ? "" : "each ") + Expectation(item);
