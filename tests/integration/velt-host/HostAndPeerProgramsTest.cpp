@@ -30,7 +30,7 @@ std::string AnnouncedPort(HostProcess& peer) {
 
 }  // namespace
 
-TEST(PeerProgram, TokensTravelBothWaysBetweenTheTwoPrograms) {
+TEST(HostAndPeerPrograms, TokensTravelBothWays) {
   ScratchFolder scratch;
   HostProcess peer(
       {"tcp",           "--port", "0",        "--echo", "--rx-prefix", "02",
