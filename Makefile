@@ -1,6 +1,8 @@
 # Thin wrapper over the CMake presets.
 #   make test   builds and runs every test suite (default, asan and tsan builds)
+#               and the demo once, after the default suite
 #   make build  builds the default preset only
+#   make demo   builds the default preset and runs velt-host's demo
 #   make format applies clang-format; make format-check only checks
 
 SHELL := /bin/sh
@@ -10,9 +12,10 @@ export CMAKE_GENERATOR ?= $(if $(shell command -v ninja 2>/dev/null),Ninja,Unix 
 FORMAT_DIRS := src hostapi tests host tools bench fuzz examples
 FORMAT_FILES = $(shell find $(FORMAT_DIRS) -name '*.h' -o -name '*.cpp' 2>/dev/null | sort)
 
-.PHONY: test deps build format format-check tidy clean $(addprefix suite-,default asan tsan clang)
+.PHONY: test deps build demo run-demo format format-check tidy clean \
+	$(addprefix suite-,default asan tsan clang)
 
-test: deps format-check suite-default suite-asan suite-tsan
+test: deps format-check suite-default run-demo suite-asan suite-tsan
 	@echo "all test suites passed"
 
 deps:
@@ -30,6 +33,16 @@ $(foreach preset,default asan tsan clang,$(eval $(call SUITE,$(preset))))
 build: deps
 	cmake --preset default
 	cmake --build --preset default -j $(JOBS)
+
+# The programs and the plug-in of a build share its bin/ folder.
+DEMO := build/default/bin/velt-host demo
+
+demo: build
+	$(DEMO)
+
+# The demo as a test: once, with the default suite's build.
+run-demo: suite-default
+	$(DEMO)
 
 format-check:
 	@clang-format --dry-run --Werror $(FORMAT_FILES)

@@ -1,0 +1,24 @@
+#include "velt-host/ConsoleOutput.h"
+
+namespace velthost {
+
+void ConsoleOutput::Write(std::FILE* file, const std::string& text) {
+  std::fwrite(text.data(), 1, text.size(), file);
+  std::fflush(file);
+}
+
+void ConsoleOutput::Reply(const std::string& text) {
+  Write(out_, !text.empty() && text.back() == '\n' ? text : text + "\n");
+}
+
+void ConsoleOutput::Line(const std::string& text) { Write(out_, text + "\n"); }
+
+void ConsoleOutput::Error(const std::string& text) { Write(err_, "velt-host: " + text + "\n"); }
+
+void ConsoleOutput::Message(const std::string& text) {
+  if (!quiet_) {
+    Line(text);
+  }
+}
+
+}  // namespace velthost

@@ -1,0 +1,33 @@
+#pragma once
+
+#include <string>
+
+namespace velthost {
+
+// Where velt-host looks for the plug-in and keeps its permanent storage when
+// the command line does not say.
+class DefaultPaths {
+ public:
+  static constexpr const char* kPluginFile = "libvelt.so";
+
+  // The folder of the running program (from /proc/self/exe); empty when it
+  // cannot be told.
+  static std::string ExecutableFolder();
+  // libvelt.so beside the program (as in the build tree), else in ../lib
+  // beside it (as installed); the first when neither exists, so that the
+  // error names it.
+  static std::string PluginPath(const std::string& executableFolder);
+  // $XDG_STATE_HOME/velt/storage.ini when stateHome is an absolute path,
+  // else HOME/.local/state/velt/storage.ini; empty when neither is usable.
+  static std::string StoragePath(const char* stateHome, const std::string& home);
+  // The user's home folder: $HOME, else the password database's entry.
+  static std::string Home();
+  // Creates folder and its missing parents (new ones readable by the owner
+  // only); false with error set when that fails.
+  static bool MakeFolders(const std::string& folder, std::string& error);
+  static bool IsFolder(const std::string& path);
+  // The folder part of a file path ("." for a bare name).
+  static std::string FolderOf(const std::string& path);
+};
+
+}  // namespace velthost

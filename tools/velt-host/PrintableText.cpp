@@ -1,0 +1,24 @@
+#include "velt-host/PrintableText.h"
+
+namespace velthost {
+
+std::string PrintableText::Escape(const std::string& bytes) {
+  static const char kDigits[] = "0123456789ABCDEF";
+  std::string text;
+  text.reserve(bytes.size());
+  for (const char c : bytes) {
+    const auto byte = static_cast<unsigned char>(c);
+    if (byte == '\\') {
+      text += "\\\\";
+    } else if (byte >= 0x20 && byte < 0x7F) {
+      text += c;
+    } else {
+      text += "\\x";
+      text += kDigits[byte >> 4U];
+      text += kDigits[byte & 0x0FU];
+    }
+  }
+  return text;
+}
+
+}  // namespace velthost
