@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <cstring>
 #include <system_error>
@@ -94,12 +95,12 @@ bool HostSocket::ParseAddress(const char* ip, unsigned short port, sockaddr_in& 
 
 HostSocket::WaitResult HostSocket::WaitFor(int fd, short events, Clock::time_point deadline) {
   const int stopFd = HostTask::CurrentStopDescriptor();
-  pollfd fds[2] = {{fd, events, 0}, {stopFd, POLLIN, 0}};
+  std::array<pollfd, 2> fds = {{{fd, events, 0}, {stopFd, POLLIN, 0}}};
   const nfds_t count = stopFd >= 0 ? 2 : 1;
   for (;;) {
     const auto left = std::chrono::ceil<std::chrono::milliseconds>(deadline - Clock::now());
     const int timeout = static_cast<int>(std::max<std::chrono::milliseconds::rep>(left.count(), 0));
-    const int rc = ::poll(fds, count, timeout);
+    const int rc = ::poll(fds.data(), count, timeout);
     if (rc < 0) {
       if (errno == EINTR) {
         continue;

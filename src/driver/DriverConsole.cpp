@@ -11,7 +11,7 @@ namespace {
 
 // The driver's help, appended after the framework's. The first line reads
 // "connect cmd" although the command takes ON or OFF.
-const char kHelp[] =
+const char* const kHelp =
     "connect cmd - set connect ON or OFF\n"
     "get_stat - get status of connection\n"
     "set_ip_port ip port - set new ip/port values\n"
