@@ -107,9 +107,11 @@ void HostTask::Run() {
   try {
     runner_->Task();
   } catch (const std::exception& e) {
-    std::fprintf(stderr, "velt host: task %s ended by an exception: %s\n", name_.c_str(), e.what());
+    // A failed write to standard error has nowhere left to be reported.
+    (void)std::fprintf(stderr, "velt host: task %s ended by an exception: %s\n", name_.c_str(),
+                       e.what());
   } catch (...) {
-    std::fprintf(stderr, "velt host: task %s ended by an unknown exception\n", name_.c_str());
+    (void)std::fprintf(stderr, "velt host: task %s ended by an unknown exception\n", name_.c_str());
   }
   CurrentTask() = nullptr;
   {
