@@ -26,7 +26,7 @@ StoredSections Load(const std::string& path) {
   std::string error;
   switch (DurableFile::Read(path, contents, error)) {
     case DurableFile::ReadResult::Missing:
-      return StoredSections();
+      return {};
     case DurableFile::ReadResult::Failed:
       throw StorageError(path, 0, error);
     case DurableFile::ReadResult::Read:

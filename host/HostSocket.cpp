@@ -69,7 +69,7 @@ FileDescriptor HostSocket::Open(bool tcp, std::string& error) {
                   : SetOption(fd.Get(), SOL_SOCKET, SO_BROADCAST));
   if (!ok) {
     error = SystemError("setsockopt", errno);
-    return FileDescriptor();
+    return {};
   }
   return fd;
 }

@@ -175,7 +175,7 @@ std::string ParameterReplacer::readStoredText(const std::string& fullName) const
     }
     // A host that fills the whole buffer without a terminator still cannot
     // make the copy run past it.
-    return std::string(buffer.begin(), std::find(buffer.begin(), buffer.end(), '\0'));
+    return {buffer.begin(), std::find(buffer.begin(), buffer.end(), '\0')};
   }
   const char* const text = piPermanentStorage->GetStringValue(section.c_str(), fullName.c_str());
   if (text == nullptr) {

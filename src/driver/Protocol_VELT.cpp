@@ -128,8 +128,8 @@ int GetInteger(const unsigned char* data, int room, int naturalLength) {
 std::string GetText(const unsigned char* data, int room) {
   const auto* const text = reinterpret_cast<const char*>(data);
   const auto* const zero = static_cast<const char*>(std::memchr(text, 0, room));
-  return std::string(text, zero == nullptr ? static_cast<std::size_t>(room)
-                                           : static_cast<std::size_t>(zero - text));
+  return {text,
+          zero == nullptr ? static_cast<std::size_t>(room) : static_cast<std::size_t>(zero - text)};
 }
 
 // Writes text up to its first zero byte, terminated; false when it does not
@@ -542,7 +542,7 @@ void Protocol_VELT::sendFrame(const std::string& frame) {
 // ---------------------------------------------------------------------------
 // Reading.
 
-int Protocol_VELT::roomOf(const Tag_VELT* tag, int count) const {
+int Protocol_VELT::roomOf(const Tag_VELT* tag, int count) {
   const ICU_Type natural = tag->getMemoryType()->getNaturalType();
   if (ProtUtilsN::IsBitType(natural)) {
     return std::max(1, (count + 7) / 8);

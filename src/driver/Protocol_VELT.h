@@ -119,7 +119,7 @@ class Protocol_VELT final : public ProtocolBase {
   bool writeParameter(const Tag_VELT* tag, const RuntimeParameter& parameter,
                       const unsigned char* data, int room);
   bool applyParameters();
-  int roomOf(const Tag_VELT* tag, int count) const;
+  static int roomOf(const Tag_VELT* tag, int count);
 
   TaskRunner_VELT runner;
   std::atomic<bool> running{false};

@@ -19,12 +19,8 @@ const std::array<const char*, 15> kRuntimeParameters = {
     "SP_TxSuffix",       "SP_Gap",           "SP_HexTokens",  "SP_TokenQueueSize", "SP_Done"};
 
 bool IsRuntimeParameterName(const std::string& name) {
-  for (const char* candidate : kRuntimeParameters) {
-    if (name == candidate) {
-      return true;
-    }
-  }
-  return false;
+  return std::any_of(kRuntimeParameters.begin(), kRuntimeParameters.end(),
+                     [&name](const char* candidate) { return name == candidate; });
 }
 
 }  // namespace

@@ -114,7 +114,7 @@ const char* ProtocolBase::GetIdent() const {
   return identText.empty() ? GetName() : identText.c_str();
 }
 
-void ProtocolBase::SetIdent(const char* text) { identText = text == nullptr ? "" : text; }
+void ProtocolBase::SetIdent(const char* ident) { identText = ident == nullptr ? "" : ident; }
 
 // --- reading ---
 

@@ -104,9 +104,9 @@ Endpoint Endpoint::LocalOf(int fd) {
   sockaddr_storage address{};
   socklen_t length = sizeof address;
   if (::getsockname(fd, reinterpret_cast<sockaddr*>(&address), &length) != 0) {
-    return Endpoint();
+    return {};
   }
-  return Endpoint(reinterpret_cast<const sockaddr*>(&address), length);
+  return {reinterpret_cast<const sockaddr*>(&address), length};
 }
 
 // The family-specific views are copied out rather than cast, so that no
