@@ -57,7 +57,7 @@ std::string TokenEmitter::Payload(std::uint64_t number) const {
     out += digits;
     from = at + kCounterPlaceholder.size();
   }
-  out.append(payload_, from, std::string::npos);
+  out.append(payload_, from);
   return out;
 }
 
