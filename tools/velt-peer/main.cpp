@@ -1,10 +1,10 @@
 // velt-peer: the device simulator's command-line program.
 
 #include <pthread.h>
-#include <signal.h>
 #include <unistd.h>
 
 #include <chrono>
+#include <csignal>
 #include <cstdio>
 #include <ctime>
 #include <string>
