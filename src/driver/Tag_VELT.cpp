@@ -26,6 +26,9 @@ bool IsRuntimeParameterName(const std::string& name) {
 }  // namespace
 
 Tag_VELT::Tag_VELT(const char* uri_, Protocol_VELT* protocol) : uri(uri_ == nullptr ? "" : uri_) {
+  // A false positive: valid is the first field, so as a member initialiser
+  // the parse would run before uri and the fields it fills are initialised.
+  // NOLINTNEXTLINE(cppcoreguidelines-prefer-member-initializer)
   valid = parseTagUrl(protocol) ? 1 : 0;
 }
 
