@@ -6,6 +6,13 @@
 // reads nothing but its identity.
 class HostCDSBuffer final : public ICDSBuffer {
  public:
+  HostCDSBuffer() = default;
+  HostCDSBuffer(const HostCDSBuffer&) = delete;
+  HostCDSBuffer& operator=(const HostCDSBuffer&) = delete;
+  HostCDSBuffer(HostCDSBuffer&&) = delete;
+  HostCDSBuffer& operator=(HostCDSBuffer&&) = delete;
+  virtual ~HostCDSBuffer() = default;
+
   // "HostCDSBuffer".
   const char* GetImpName() const override;
   // 100.

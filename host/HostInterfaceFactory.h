@@ -34,7 +34,7 @@ class HostInterfaceFactory final : public IInterfaceFactory {
   HostInterfaceFactory(HostInterfaceFactory&&) = delete;
   HostInterfaceFactory& operator=(HostInterfaceFactory&&) = delete;
   // Tasks still running are stopped and joined first, then sockets closed.
-  ~HostInterfaceFactory() = default;
+  virtual ~HostInterfaceFactory() = default;
 
   IInterface* CreateInterface(const char* name) override;
   // Gives back one hand-out. Null is ignored; a pointer this factory did not

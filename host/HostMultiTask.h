@@ -21,7 +21,7 @@ class HostMultiTask final : public IMultiTask2 {
   HostMultiTask& operator=(HostMultiTask&&) = delete;
   // Asks every task not yet deleted to stop and waits for each runner to
   // return, then frees the remaining mutexes.
-  ~HostMultiTask();
+  virtual ~HostMultiTask();
 
   // "HostMultiTask".
   const char* GetImpName() const override;

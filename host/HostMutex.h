@@ -14,7 +14,7 @@ class HostMutex final : public IMutex {
   HostMutex& operator=(const HostMutex&) = delete;
   HostMutex(HostMutex&&) = delete;
   HostMutex& operator=(HostMutex&&) = delete;
-  ~HostMutex() = default;
+  virtual ~HostMutex() = default;
 
   void Lock() override;
   void Unlock() override;

@@ -10,8 +10,12 @@
 
 namespace {
 
-// Backs the pointers GetStringValue returns: one text per thread.
-thread_local std::string lastStringRead;
+// Backs the pointers GetStringValue returns: one text per thread, reached
+// only through this function.
+std::string& LastStringRead() {
+  thread_local std::string text;
+  return text;
+}
 
 bool Same(const char* name, const char* expected) {
   return name != nullptr && std::strcmp(name, expected) == 0;
@@ -22,7 +26,7 @@ StoredSections Load(const std::string& path) {
   std::string error;
   switch (DurableFile::Read(path, contents, error)) {
     case DurableFile::ReadResult::Missing:
-      return StoredSections();
+      return {};
     case DurableFile::ReadResult::Failed:
       throw StorageError(path, 0, error);
     case DurableFile::ReadResult::Read:
@@ -60,8 +64,9 @@ void HostPermanentStorage::SetIntValue(const char* section, const char* name, in
 
 const char* HostPermanentStorage::GetStringValue(const char* section, const char* name) {
   StoredValue value;
-  lastStringRead = Find(section, name, value) ? value.AsText() : std::string();
-  return lastStringRead.c_str();
+  std::string& text = LastStringRead();
+  text = Find(section, name, value) ? value.AsText() : std::string();
+  return text.c_str();
 }
 
 bool HostPermanentStorage::GetBoolValue(const char* section, const char* name) {

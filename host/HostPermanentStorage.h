@@ -21,7 +21,7 @@ class HostPermanentStorage final : public IPermanentStorage2 {
   HostPermanentStorage& operator=(const HostPermanentStorage&) = delete;
   HostPermanentStorage(HostPermanentStorage&&) = delete;
   HostPermanentStorage& operator=(HostPermanentStorage&&) = delete;
-  ~HostPermanentStorage() = default;
+  virtual ~HostPermanentStorage() = default;
 
   // Itself for "IPermanentStorage" and "IPermanentStorage2", else null.
   IInterface* ConvertTo(const char* name) override;

@@ -7,6 +7,13 @@
 // its information text.
 class HostSerialFactory final : public ISerialFactory {
  public:
+  HostSerialFactory() = default;
+  HostSerialFactory(const HostSerialFactory&) = delete;
+  HostSerialFactory& operator=(const HostSerialFactory&) = delete;
+  HostSerialFactory(HostSerialFactory&&) = delete;
+  HostSerialFactory& operator=(HostSerialFactory&&) = delete;
+  virtual ~HostSerialFactory() = default;
+
   // "HostSerialFactory".
   const char* GetImpName() const override;
   // 100.

@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <cstring>
 #include <limits>
@@ -69,7 +70,7 @@ FileDescriptor HostSocket::Open(bool tcp, std::string& error) {
                   : SetOption(fd.Get(), SOL_SOCKET, SO_BROADCAST));
   if (!ok) {
     error = SystemError("setsockopt", errno);
-    return FileDescriptor();
+    return {};
   }
   return fd;
 }
@@ -95,7 +96,7 @@ bool HostSocket::ParseAddress(const char* ip, unsigned short port, sockaddr_in& 
 
 HostSocket::WaitResult HostSocket::WaitFor(int fd, short events, Clock::time_point deadline) {
   const int stopFd = HostTask::CurrentStopDescriptor();
-  pollfd fds[2] = {{fd, events, 0}, {stopFd, POLLIN, 0}};
+  std::array<pollfd, 2> fds = {{{fd, events, 0}, {stopFd, POLLIN, 0}}};
   const nfds_t count = stopFd >= 0 ? 2 : 1;
   const bool unlimited = deadline == Clock::time_point::max();
   for (;;) {
@@ -103,7 +104,7 @@ HostSocket::WaitResult HostSocket::WaitFor(int fd, short events, Clock::time_poi
     const int timeout = unlimited ? -1
                                   : static_cast<int>(std::clamp<std::chrono::milliseconds::rep>(
                                         left.count(), 0, std::numeric_limits<int>::max()));
-    const int rc = ::poll(fds, count, timeout);
+    const int rc = ::poll(fds.data(), count, timeout);
     if (rc < 0) {
       if (errno == EINTR) {
         continue;

@@ -52,7 +52,7 @@ class HostSocket final : public ISocket {
   HostSocket& operator=(const HostSocket&) = delete;
   HostSocket(HostSocket&&) = delete;
   HostSocket& operator=(HostSocket&&) = delete;
-  ~HostSocket() = default;
+  virtual ~HostSocket() = default;
 
   // 0 on success, -1 on failure (bad address text, refused, timed out,
   // stopped). UDP: any IPv4 address and port are accepted as the peer.

@@ -21,7 +21,7 @@ class HostSocketFactory final : public ISocketFactory2 {
   HostSocketFactory& operator=(const HostSocketFactory&) = delete;
   HostSocketFactory(HostSocketFactory&&) = delete;
   HostSocketFactory& operator=(HostSocketFactory&&) = delete;
-  ~HostSocketFactory() = default;
+  virtual ~HostSocketFactory() = default;
 
   // "HostSocketFactory".
   const char* GetImpName() const override;

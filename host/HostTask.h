@@ -24,7 +24,7 @@ class HostTask final : public ITask {
   HostTask(HostTask&&) = delete;
   HostTask& operator=(HostTask&&) = delete;
   // Asks the task to stop and waits until its runner has returned.
-  ~HostTask();
+  virtual ~HostTask();
 
   // Non-zero once a stop has been requested.
   int IsStopping() const override;

@@ -13,6 +13,16 @@ std::string LastDlError() {
   return text == nullptr ? std::string("unknown error") : std::string(text);
 }
 
+// The interface that the plug-in hands out under name, or null.
+template <typename Interface>
+Interface* CreateByName(IInterfaceFactory& factory, const char* name) {
+  // A false positive: the name fixes the type, as the host interfaces are
+  // converted by name; IInterface declares no virtual function, so no checked
+  // cast could be used instead.
+  // NOLINTNEXTLINE(cppcoreguidelines-pro-type-static-cast-downcast)
+  return static_cast<Interface*>(factory.CreateInterface(name));
+}
+
 }  // namespace
 
 void PluginLoader::LibraryCloser::operator()(void* handle) const { ::dlclose(handle); }
@@ -32,11 +42,11 @@ PluginLoader::PluginLoader(const std::string& path, IInterfaceFactory& host) : p
   if (entry_ == nullptr) {
     throw std::runtime_error(name + ": GetInterfaceFactory returned null");
   }
-  module_ = static_cast<IProtModule*>(entry_->CreateInterface("IProtModule"));
+  module_ = CreateByName<IProtModule>(*entry_, "IProtModule");
   if (module_ == nullptr) {
     throw std::runtime_error(name + " offers no IProtModule");
   }
-  protocols_ = static_cast<IProtocolFactory*>(entry_->CreateInterface("IProtocolFactory"));
+  protocols_ = CreateByName<IProtocolFactory>(*entry_, "IProtocolFactory");
   if (protocols_ == nullptr) {
     entry_->ReleaseInterface(module_);
     throw std::runtime_error(name + " offers no IProtocolFactory");

@@ -211,7 +211,7 @@ bool ParseLine(std::string_view line, StoredSections& sections, StoredEntries*& 
     return true;
   }
   if (line[pos] != '"') {
-    reason = "expected a [\"section\"] header or a \"name\" = TYPE VALUE entry";
+    reason = R"(expected a ["section"] header or a "name" = TYPE VALUE entry)";
     return false;
   }
   std::string name;

@@ -1,6 +1,7 @@
 #include "config/CfgParser.h"
 
 #include <algorithm>
+#include <array>
 #include <cctype>
 #include <cerrno>
 #include <climits>
@@ -25,9 +26,9 @@ bool allDigits(const std::string& text) {
 // "Node<number>::"; the number as itoa writes it, so without leading zeros.
 // A negative number keeps its sign so that it never reads as another node.
 std::string nodePrefix(int node) {
-  char digits[12] = {};
-  ProtUtilsN::itoa(node, digits, 10);
-  return std::string(kNode) + (node < 0 ? "-" : "") + digits + kSeparator;
+  std::array<char, 12> digits{};
+  ProtUtilsN::itoa(node, digits.data(), 10);
+  return std::string(kNode) + (node < 0 ? "-" : "") + digits.data() + kSeparator;
 }
 
 }  // namespace

@@ -4,7 +4,6 @@
 #include <cctype>
 #include <cstdio>
 #include <cstdlib>
-#include <iterator>
 #include <string>
 
 namespace {
@@ -32,7 +31,7 @@ bool IPParser::Parse(const char* text) {
     return false;
   }
   const std::string address(text);
-  unsigned char parsed[4] = {};
+  std::array<unsigned char, 4> parsed{};
   std::string::size_type start = 0;
   for (int index = 0; index < 3; ++index) {
     const std::string::size_type dot = address.find('.', start);
@@ -46,7 +45,7 @@ bool IPParser::Parse(const char* text) {
   if (!parseOctet(address.substr(start), parsed[3])) {
     return false;
   }
-  std::copy(std::begin(parsed), std::end(parsed), std::begin(octets));
+  octets = parsed;
   return true;
 }
 

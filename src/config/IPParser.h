@@ -1,5 +1,7 @@
 #pragma once
 
+#include <array>
+
 // Reads a dotted-quad IPv4 address. Each of the four pieces is empty (read as
 // 0, so "1..2.3" is 1.0.2.3 and "1.2.3." is 1.2.3.0) or decimal digits only,
 // converted as strtol does with base 0 (a leading 0 makes it octal: "010" is
@@ -10,7 +12,7 @@ class IPParser {
   // being the leftmost. On false octets is unchanged. Null is not an address.
   bool Parse(const char* text);
 
-  unsigned char octets[4] = {0, 0, 0, 0};
+  std::array<unsigned char, 4> octets{0, 0, 0, 0};
 };
 
 // The address of a dotted quad as a 32-bit number, first octet most

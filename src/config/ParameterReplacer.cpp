@@ -165,7 +165,9 @@ ParameterReplacer::Variant ParameterReplacer::readStored(const std::string& full
 std::string ParameterReplacer::readStoredText(const std::string& fullName) const {
   IInterface* const second = piPermanentStorage->ConvertTo("IPermanentStorage2");
   if (second != nullptr) {
-    // The storage answered the name "IPermanentStorage2", so it is one.
+    // The storage answered the name "IPermanentStorage2", so it is one: a
+    // false positive, as IInterface declares no virtual function and the
+    // host interfaces are converted by name, so no checked cast exists.
     // NOLINTNEXTLINE(cppcoreguidelines-pro-type-static-cast-downcast)
     auto* const storage2 = static_cast<IPermanentStorage2*>(second);
     std::array<char, kTextBufferSize> buffer{};
@@ -175,7 +177,7 @@ std::string ParameterReplacer::readStoredText(const std::string& fullName) const
     }
     // A host that fills the whole buffer without a terminator still cannot
     // make the copy run past it.
-    return std::string(buffer.begin(), std::find(buffer.begin(), buffer.end(), '\0'));
+    return {buffer.begin(), std::find(buffer.begin(), buffer.end(), '\0')};
   }
   const char* const text = piPermanentStorage->GetStringValue(section.c_str(), fullName.c_str());
   if (text == nullptr) {

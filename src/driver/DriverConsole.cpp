@@ -11,7 +11,7 @@ namespace {
 
 // The driver's help, appended after the framework's. The first line reads
 // "connect cmd" although the command takes ON or OFF.
-const char kHelp[] =
+const char* const kHelp =
     "connect cmd - set connect ON or OFF\n"
     "get_stat - get status of connection\n"
     "set_ip_port ip port - set new ip/port values\n"
@@ -41,15 +41,33 @@ bool DriverConsole::Run(const std::string& command, char* output, int outputSize
   std::vector<std::string> words;
   ProtUtilsN::ParseSubstrings(command, words, ' ');
   const std::string& verb = words.front();
-  if (verb == "help") return Help(command, output, outputSize);
-  if (verb == "connect") return Connect(words, output, outputSize);
-  if (verb == "set_ip_port") return SetIpPort(words, output, outputSize);
-  if (verb == "put") return Put(command, output, outputSize);
-  if (verb == "get") return Get(output, outputSize);
-  if (verb == "tokens_available") return TokensAvailable(output, outputSize);
-  if (verb == "get_token_length") return GetTokenLength(output, outputSize);
-  if (verb == "token_ack") return TokenAck(output, outputSize);
-  if (verb == "get_stat") return GetStat(output, outputSize);
+  if (verb == "help") {
+    return Help(command, output, outputSize);
+  }
+  if (verb == "connect") {
+    return Connect(words, output, outputSize);
+  }
+  if (verb == "set_ip_port") {
+    return SetIpPort(words, output, outputSize);
+  }
+  if (verb == "put") {
+    return Put(command, output, outputSize);
+  }
+  if (verb == "get") {
+    return Get(output, outputSize);
+  }
+  if (verb == "tokens_available") {
+    return TokensAvailable(output, outputSize);
+  }
+  if (verb == "get_token_length") {
+    return GetTokenLength(output, outputSize);
+  }
+  if (verb == "token_ack") {
+    return TokenAck(output, outputSize);
+  }
+  if (verb == "get_stat") {
+    return GetStat(output, outputSize);
+  }
   return protocol_.ProtocolBase::DoCommand(command.c_str(), output, outputSize);
 }
 

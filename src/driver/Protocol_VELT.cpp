@@ -1,6 +1,7 @@
 #include "driver/Protocol_VELT.h"
 
 #include <algorithm>
+#include <array>
 #include <cstdint>
 #include <cstring>
 #include <vector>
@@ -44,7 +45,7 @@ struct MemoryTypeEntry {
 
 // The channel's memory types, in registration order.
 // clang-format off
-const MemoryTypeEntry kMemoryTypes[] = {
+const std::array<MemoryTypeEntry, 21> kMemoryTypes = {{
     {"tx_token",          ICU_BYTE,           0x200, false, true,  999999999, 999999999, 999999999},
     {"rx_token",          ICU_BYTE,           0x200, true,  false, 999999999, 999999999, 0},
     {"rx_token_len",      ICU_UNSIGNED_INT,   0x40,  true,  false, 1,    1,    0},
@@ -66,7 +67,7 @@ const MemoryTypeEntry kMemoryTypes[] = {
     {"SP_Done",           ICU_BOOLEAN,        0x1,   false, false, 1,    0,    0},
     {"conn_stat",         ICU_BOOLEAN,        0x1,   true,  false, 1,    0,    0},
     {"connect",           ICU_BOOLEAN,        0x1,   false, false, 1,    0,    0},
-};
+}};
 // clang-format on
 
 Model BuildModel() {
@@ -127,8 +128,8 @@ int GetInteger(const unsigned char* data, int room, int naturalLength) {
 std::string GetText(const unsigned char* data, int room) {
   const auto* const text = reinterpret_cast<const char*>(data);
   const auto* const zero = static_cast<const char*>(std::memchr(text, 0, room));
-  return std::string(text, zero == nullptr ? static_cast<std::size_t>(room)
-                                           : static_cast<std::size_t>(zero - text));
+  return {text,
+          zero == nullptr ? static_cast<std::size_t>(room) : static_cast<std::size_t>(zero - text)};
 }
 
 // Writes text up to its first zero byte, terminated; false when it does not
@@ -149,7 +150,7 @@ bool PutText(unsigned char* data, int room, int varLength, const std::string& te
 Protocol_VELT::Protocol_VELT()
     : runner(piMultiTask, this),
       tokenQueue(piMultiTask != nullptr ? piMultiTask->CreateMutex() : nullptr),
-      rxBuffer(new unsigned char[kRxBufferSize]()) {
+      rxBuffer(kRxBufferSize) {
   memoryManager.addModel(BuildModel());
 }
 
@@ -166,9 +167,9 @@ Protocol_VELT::~Protocol_VELT() {
 }
 
 IInterface* Protocol_VELT::ConvertTo(const char* name) {
-  static const char* const kNames[] = {"Protocol_VELT", "ProtocolBase", "IProtocol7",
-                                       "IProtocol6",    "IProtocol5",   "IProtocol4",
-                                       "IProtocol3",    "IProtocol2",   "IProtocol"};
+  static const std::array<const char*, 9> kNames = {"Protocol_VELT", "ProtocolBase", "IProtocol7",
+                                                    "IProtocol6",    "IProtocol5",   "IProtocol4",
+                                                    "IProtocol3",    "IProtocol2",   "IProtocol"};
   for (const char* candidate : kNames) {
     if (CompareInterface(name, candidate) != 0) {
       return this;
@@ -193,8 +194,8 @@ int Protocol_VELT::GetNodeID(const ITag* tag) {
 const char* Protocol_VELT::GetXml() const { return GetXml_VELT(); }
 
 const char* const* Protocol_VELT::tagUriNames() const {
-  static const char* const kFields[] = {"node", "memorytype", "datatype", nullptr};
-  return kFields;
+  static const std::array<const char*, 4> kFields = {"node", "memorytype", "datatype", nullptr};
+  return kFields.data();
 }
 
 char* Protocol_VELT::_jstrcpy(char* dst, const char* src) {
@@ -312,9 +313,9 @@ bool Protocol_VELT::initSocket(const ChannelSettings& current) {
       SetError(-6, "Can't get IP adapter info");
       return false;
     }
-    char text[16];
-    ipToString(adapter | ~mask, text);
-    localBroadcastAddress = text;
+    std::array<char, 16> text{};
+    ipToString(adapter | ~mask, text.data());
+    localBroadcastAddress = text.data();
     factory->DeleteSocket(probe, 0);
   }
   socket.store(factory->CreateSocket(static_cast<unsigned short>(current.localPort),
@@ -369,8 +370,9 @@ int Protocol_VELT::Extend(int code, void* data) {
   if (code == 0) {
     std::int32_t kind = 0;
     std::memcpy(&kind, record, sizeof kind);
-    const unsigned char flags[4] = {static_cast<unsigned char>(kind == 3 ? 1 : 0), 0, 0, 0};
-    std::memcpy(record + sizeof kind, flags, sizeof flags);
+    const auto first = static_cast<unsigned char>(kind == 3 ? 1 : 0);
+    const std::array<unsigned char, 4> flags = {first, 0, 0, 0};
+    std::memcpy(record + sizeof kind, flags.data(), flags.size());
     return 1;
   }
   if (code == 3) {
@@ -483,11 +485,11 @@ void Protocol_VELT::receiveDatagrams(ISocket* sock) {
     addToken(held, token);
   };
   for (;;) {
-    const int received = sock->Receive(rxBuffer.get(), kRxBufferSize, kDatagramTimeout);
+    const int received = sock->Receive(rxBuffer.data(), kRxBufferSize, kDatagramTimeout);
     if (received < 1) {
       return;
     }
-    framing.Split(rxBuffer.get(), static_cast<std::size_t>(std::min(received, kRxBufferSize)),
+    framing.Split(rxBuffer.data(), static_cast<std::size_t>(std::min(received, kRxBufferSize)),
                   emit);
   }
 }
@@ -548,7 +550,7 @@ void Protocol_VELT::sendFrame(const std::string& frame) {
 // ---------------------------------------------------------------------------
 // Reading.
 
-int Protocol_VELT::roomOf(const Tag_VELT* tag, int count) const {
+int Protocol_VELT::roomOf(const Tag_VELT* tag, int count) {
   const ICU_Type natural = tag->getMemoryType()->getNaturalType();
   if (ProtUtilsN::IsBitType(natural)) {
     return std::max(1, (count + 7) / 8);

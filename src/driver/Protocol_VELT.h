@@ -1,9 +1,9 @@
 #pragma once
 
 #include <atomic>
-#include <memory>
 #include <mutex>
 #include <string>
+#include <vector>
 
 #include "config/GroupParameterReplacer.h"
 #include "config/ParamManager.h"
@@ -119,7 +119,7 @@ class Protocol_VELT final : public ProtocolBase {
   bool writeParameter(const Tag_VELT* tag, const RuntimeParameter& parameter,
                       const unsigned char* data, int room);
   bool applyParameters();
-  int roomOf(const Tag_VELT* tag, int count) const;
+  static int roomOf(const Tag_VELT* tag, int count);
 
   TaskRunner_VELT runner;
   std::atomic<bool> running{false};
@@ -135,7 +135,7 @@ class Protocol_VELT final : public ProtocolBase {
   SettingsStore settings;
   TokenQueue tokenQueue;
   std::string localBroadcastAddress{"255.255.255.255"};
-  std::unique_ptr<unsigned char[]> rxBuffer;
+  std::vector<unsigned char> rxBuffer;
   std::atomic<bool> reinitRequired{false};
   std::atomic<bool> connected{false};
   std::atomic<bool> connectRequested{false};

@@ -1,5 +1,7 @@
 #include "driver/RuntimeParameter.h"
 
+#include <array>
+
 #include "protlib/HexText.h"
 
 namespace {
@@ -48,13 +50,13 @@ const RuntimeParameter kDone{"SP_Done", "", Kind::Apply,
     nullptr, nullptr, nullptr, nullptr, nullptr, nullptr, false};
 // clang-format on
 
-const RuntimeParameter* const kAll[] = {
+const std::array<const RuntimeParameter*, 14> kAll = {
     &kSocketType, &kRemoteIp, &kRemotePort, &kLocalIp,  &kLocalPort, &kBroadcastType,  &kRxPrefix,
     &kRxSuffix,   &kGap,      &kTxPrefix,   &kTxSuffix, &kHexTokens, &kTokenQueueSize, &kDone};
 
 // An apply reloads the socket settings first, then the framing and queue
 // settings.
-const RuntimeParameter* const kReloadOrder[] = {
+const std::array<const RuntimeParameter*, 14> kReloadOrder = {
     &kSocketType, &kLocalIp,  &kLocalPort, &kRemoteIp, &kRemotePort, &kBroadcastType,  &kRxPrefix,
     &kRxSuffix,   &kTxPrefix, &kTxSuffix,  &kGap,      &kHexTokens,  &kTokenQueueSize, nullptr};
 
@@ -69,4 +71,4 @@ const RuntimeParameter* RuntimeParameter::ForMemoryType(const std::string& memor
   return nullptr;
 }
 
-const RuntimeParameter* const* RuntimeParameter::ReloadOrder() { return kReloadOrder; }
+const RuntimeParameter* const* RuntimeParameter::ReloadOrder() { return kReloadOrder.data(); }

@@ -1,5 +1,7 @@
 #include "driver/Tag_VELT.h"
 
+#include <algorithm>
+#include <array>
 #include <cstdlib>
 #include <vector>
 
@@ -11,23 +13,22 @@ namespace {
 // The memory types that stage runtime parameters. "SP_ConnectTimeout" is not
 // offered by the model today but stays in the list, so a model that offers it
 // makes it a runtime parameter at once.
-const char* const kRuntimeParameters[] = {
+const std::array<const char*, 15> kRuntimeParameters = {
     "SP_SocketType",     "SP_RemoteIP",      "SP_RemotePort", "SP_LocalIP",        "SP_LocalPort",
     "SP_ConnectTimeout", "SP_BroadcastType", "SP_RxPrefix",   "SP_RxSuffix",       "SP_TxPrefix",
     "SP_TxSuffix",       "SP_Gap",           "SP_HexTokens",  "SP_TokenQueueSize", "SP_Done"};
 
 bool IsRuntimeParameterName(const std::string& name) {
-  for (const char* candidate : kRuntimeParameters) {
-    if (name == candidate) {
-      return true;
-    }
-  }
-  return false;
+  return std::any_of(kRuntimeParameters.begin(), kRuntimeParameters.end(),
+                     [&name](const char* candidate) { return name == candidate; });
 }
 
 }  // namespace
 
 Tag_VELT::Tag_VELT(const char* uri_, Protocol_VELT* protocol) : uri(uri_ == nullptr ? "" : uri_) {
+  // A false positive: valid is the first field, so as a member initialiser
+  // the parse would run before uri and the fields it fills are initialised.
+  // NOLINTNEXTLINE(cppcoreguidelines-prefer-member-initializer)
   valid = parseTagUrl(protocol) ? 1 : 0;
 }
 

@@ -1,5 +1,7 @@
 #include "driver/TokenQueue.h"
 
+#include <string_view>
+
 #include "IMultiTask2.h"
 
 TokenQueue::Guard::Guard(TokenQueue& queue) : queue_(queue) {
@@ -23,7 +25,7 @@ void TokenQueue::Guard::Add(const std::string& token, unsigned int bound, bool h
     tokens.push_back(token);
     return;
   }
-  static const char kDigits[] = "0123456789ABCDEF";
+  constexpr std::string_view kDigits = "0123456789ABCDEF";
   std::string text;
   text.reserve(token.size() * 2);
   for (const char c : token) {

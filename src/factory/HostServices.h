@@ -15,6 +15,8 @@
 // thread, before any driver thread runs and after all have stopped; every
 // other part of the library only reads them. Null while the module is not
 // initialised or when the host does not offer an optional service.
+// NOLINTBEGIN(cppcoreguidelines-avoid-non-const-global-variables): the
+// module-wide service pointers are the library's one prescribed global state.
 extern IMultiTask2* piMultiTask;
 extern ISerialFactory* piSerialFactory;
 extern ISocketFactory2* piSocketFactory;
@@ -24,3 +26,4 @@ extern IPermanentStorage* piPermanentStorage;
 extern IDriverInterface* piDriverInterface;
 extern ISmux* piSmux;
 extern IFastTimer* piFastTimer;
+// NOLINTEND(cppcoreguidelines-avoid-non-const-global-variables)

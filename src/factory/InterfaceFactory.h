@@ -6,6 +6,13 @@
 // static parts of the module-wide Factory by name and creates nothing.
 class InterfaceFactory final : public IInterfaceFactory {
  public:
+  InterfaceFactory() = default;
+  InterfaceFactory(const InterfaceFactory&) = delete;
+  InterfaceFactory& operator=(const InterfaceFactory&) = delete;
+  InterfaceFactory(InterfaceFactory&&) = delete;
+  InterfaceFactory& operator=(InterfaceFactory&&) = delete;
+  virtual ~InterfaceFactory() = default;
+
   // "IProtocolFactory"/"ProtocolFactory": the protocol factory;
   // "IProtModule"/"ProtModule": the module; anything else: null.
   IInterface* CreateInterface(const char* name) override;

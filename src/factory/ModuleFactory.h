@@ -15,5 +15,7 @@ struct ModuleFactory {
   ProtModule protModule;
 };
 
+// The module object is, with the module-wide service pointers, the
+// library's one prescribed global state.
 // NOLINTNEXTLINE(cppcoreguidelines-avoid-non-const-global-variables)
 extern ModuleFactory Factory;

@@ -2,6 +2,8 @@
 #include "factory/GetInterfaceFactory.h"
 #include "factory/ModuleFactory.h"
 
+// The module object is, with the module-wide service pointers, the
+// library's one prescribed global state.
 // NOLINTNEXTLINE(cppcoreguidelines-avoid-non-const-global-variables)
 ModuleFactory Factory;
 

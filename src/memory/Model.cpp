@@ -1,6 +1,8 @@
 #include "memory/Model.h"
 
-Model::Model(const std::string& modelName) : name(modelName) {}
+#include <utility>
+
+Model::Model(std::string modelName) : name(std::move(modelName)) {}
 
 void Model::setMaxDatagramLength(int value) { maxDatagramLength = value; }
 

@@ -10,7 +10,7 @@
 class Model {
  public:
   // Datagram limits 0, no memory types.
-  explicit Model(const std::string& modelName);
+  explicit Model(std::string modelName);
 
   void setMaxDatagramLength(int value);
   void setMaxDatagramItems(int value);

@@ -1,8 +1,10 @@
 #include "protlib/BaseConsole.h"
 
+#include <array>
 #include <cstdio>
 #include <cstring>
 #include <memory>
+#include <string_view>
 
 #include "protlib/ProtocolBase.h"
 #include "protlib/ScratchBuffer.h"
@@ -101,9 +103,10 @@ void BaseConsole::info(char* out, int outSize) const {
 }
 
 void BaseConsole::getMaxTm(char* out, int outSize) {
-  char reply[48];
-  std::snprintf(reply, sizeof reply, "maxtm = %d ms\n", protocol.GetMaxTm(nullptr));
-  CopyReply(out, outSize, reply);
+  std::array<char, 48> reply{};
+  // Any int fits the reply buffer, so the length is not needed.
+  (void)std::snprintf(reply.data(), reply.size(), "maxtm = %d ms\n", protocol.GetMaxTm(nullptr));
+  CopyReply(out, outSize, reply.data());
 }
 
 BaseConsole::TemporaryTag BaseConsole::createTag(const std::string& uri, char* out, int outSize) {
@@ -134,7 +137,7 @@ void BaseConsole::read(const std::vector<std::string>& words, char* out, int out
     CopyReply(out, outSize, protocol.GetLastErrorString());
     return;
   }
-  static const char kDigits[] = "0123456789abcdef";
+  constexpr std::string_view kDigits = "0123456789abcdef";
   int position = 0;
   for (int i = 0; i < value.size() && outSize - position > 4; ++i) {
     out[position++] = kDigits[value.data()[i] >> 4];

@@ -1,5 +1,6 @@
 #include "protlib/BoundedText.h"
 
+#include <array>
 #include <cstdio>
 #include <cstring>
 
@@ -16,9 +17,9 @@ BoundedText& BoundedText::operator<<(const char* text) {
 }
 
 BoundedText& BoundedText::operator<<(int value) {
-  char digits[16];
-  const int length = std::snprintf(digits, sizeof digits, "%d", value);
-  put(digits, length);
+  std::array<char, 16> digits{};
+  const int length = std::snprintf(digits.data(), digits.size(), "%d", value);
+  put(digits.data(), length);
   return *this;
 }
 

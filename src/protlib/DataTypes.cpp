@@ -9,7 +9,7 @@
 
 namespace ProtUtilsN {
 
-const DataTypeEntry DataTypes[27] = {
+const std::array<DataTypeEntry, 27> DataTypes = {{
     {"boolean", ICU_BOOLEAN, ICU_NONE, 1, 0x1},
     {"byte", ICU_BYTE, ICU_NONE, 1, 0x2},
     {"short", ICU_SHORT, ICU_NONE, 2, 0x4},
@@ -37,15 +37,15 @@ const DataTypeEntry DataTypes[27] = {
     {"uint64-", ICU_UINT64_ARRAY, ICU_UINT64, 0, 0x1000000},
     {"int64-", ICU_INT64_ARRAY, ICU_INT64, 0, 0x2000000},
     {"object", ICU_OBJECT, ICU_NONE, 0, 0x4000000},
-};
+}};
 
 namespace {
 
 // Item lengths of types 1..24, indexed by type minus 1.
 // The counted types have no item length of their own; theirs comes from
 // their item type.
-const int kItemLengths[24] = {1, 1, 2, 4, 1, 2, 4, 4, 8, 0, 0, 10,
-                              0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 8, 8};
+const std::array<int, 24> kItemLengths = {1, 1, 2, 4, 1, 2, 4, 4, 8, 0, 0, 10,
+                                          0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 8, 8};
 
 const DataTypeEntry* FindByText(const std::string& text) {
   for (const DataTypeEntry& row : DataTypes) {

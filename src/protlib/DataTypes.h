@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -24,7 +25,7 @@ struct DataTypeEntry {
 
 // The 27 known types. The order is fixed: the flag of a row is 1 shifted left
 // by its row index, and searches take the first matching row.
-extern const DataTypeEntry DataTypes[27];
+extern const std::array<DataTypeEntry, 27> DataTypes;
 
 // The length of one item of the type; 0 for counted types, "object" and any
 // value outside 1..24.

@@ -1,6 +1,7 @@
 #include "protlib/ProtocolBase.h"
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <utility>
 
@@ -20,7 +21,7 @@ constexpr std::size_t kDeviceBytes = 64;
 // Arrays up to this many host bytes are accessed item by item without one.
 constexpr std::size_t kArrayBytes = 256;
 
-const char* const kNoUriFields[] = {nullptr};
+const std::array<const char*, 1> kNoUriFields = {nullptr};
 
 void Stamp(unsigned long long* ts) {
   if (ts != nullptr) {
@@ -35,8 +36,9 @@ ProtocolBase::~ProtocolBase() { DeleteTags(); }
 // --- tags ---
 
 IInterface* ProtocolBase::ConvertTo(const char* name) {
-  static const char* const kNames[] = {"ProtocolBase", "IProtocol7", "IProtocol6", "IProtocol5",
-                                       "IProtocol4",   "IProtocol3", "IProtocol2", "IProtocol"};
+  static const std::array<const char*, 8> kNames = {"ProtocolBase", "IProtocol7", "IProtocol6",
+                                                    "IProtocol5",   "IProtocol4", "IProtocol3",
+                                                    "IProtocol2",   "IProtocol"};
   for (const char* known : kNames) {
     if (CompareInterface(name, known) != 0) {
       return static_cast<IProtocol7*>(this);
@@ -112,7 +114,7 @@ const char* ProtocolBase::GetIdent() const {
   return identText.empty() ? GetName() : identText.c_str();
 }
 
-void ProtocolBase::SetIdent(const char* text) { identText = text == nullptr ? "" : text; }
+void ProtocolBase::SetIdent(const char* ident) { identText = ident == nullptr ? "" : ident; }
 
 // --- reading ---
 
@@ -273,7 +275,7 @@ bool ProtocolBase::accessArrayItem(const ITag* tag, int index, const unsigned ch
 
 // --- tag address fields ---
 
-const char* const* ProtocolBase::tagUriNames() const { return kNoUriFields; }
+const char* const* ProtocolBase::tagUriNames() const { return kNoUriFields.data(); }
 
 int ProtocolBase::getTagUriFieldCount() {
   const char* const* names = tagUriNames();

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstddef>
 #include <cstdint>
 #include <cstring>
 
@@ -50,7 +51,7 @@ bool IsBcd(const unsigned char* bytes, int length) {
 void BcdToBinary(unsigned char* item, int length) {
   std::array<unsigned char, kLongestItem> value{};
   for (int i = length - 1; i >= 0; --i) {
-    unsigned carry = static_cast<unsigned>((item[i] >> 4) * 10 + (item[i] & 0x0F));
+    auto carry = static_cast<unsigned>((item[i] >> 4) * 10 + (item[i] & 0x0F));
     for (int k = 0; k < length; ++k) {
       const unsigned product = value[static_cast<std::size_t>(k)] * 100U + carry;
       value[static_cast<std::size_t>(k)] = static_cast<unsigned char>(product & 0xFFU);
@@ -99,7 +100,7 @@ bool Bcd(unsigned char* buffer, int n, int itemLength, bool toDevice) {
   }
   const int items = n / itemLength;
   for (int i = 0; i < items; ++i) {
-    const unsigned char* item = buffer + i * itemLength;
+    const unsigned char* item = buffer + static_cast<std::ptrdiff_t>(i) * itemLength;
     const bool fits = toDevice ? LittleEndian(item, itemLength) <= LargestBcd(itemLength)
                                : IsBcd(item, itemLength);
     if (!fits) {
@@ -107,7 +108,7 @@ bool Bcd(unsigned char* buffer, int n, int itemLength, bool toDevice) {
     }
   }
   for (int i = 0; i < items; ++i) {
-    unsigned char* item = buffer + i * itemLength;
+    unsigned char* item = buffer + static_cast<std::ptrdiff_t>(i) * itemLength;
     if (toDevice) {
       BinaryToBcd(item, itemLength);
     } else {

@@ -55,7 +55,9 @@ class TagBase : public ITag {
   TagBase(TagBase&&) = default;
   TagBase& operator=(TagBase&&) = default;
 
-  // Filled by the derived tag when it parses its data-type text.
+  // Filled by the derived tag when it parses its data-type text: the
+  // data-type decoder appends to it in place, so derived tags reach it
+  // directly.
   // NOLINTNEXTLINE(cppcoreguidelines-non-private-member-variables-in-classes)
   std::vector<std::string> conversions;
 

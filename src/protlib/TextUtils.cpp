@@ -1,5 +1,6 @@
 #include "protlib/TextUtils.h"
 
+#include <array>
 #include <cctype>
 #include <cstring>
 
@@ -68,7 +69,7 @@ char* itoa(int value, char* buffer, int base) {
   unsigned int rest =
       value < 0 ? 0U - static_cast<unsigned int>(value) : static_cast<unsigned int>(value);
   const auto radix = static_cast<unsigned int>(base);
-  char reversed[sizeof(unsigned int) * 8];
+  std::array<char, sizeof(unsigned int) * 8> reversed{};
   std::size_t count = 0;
   do {
     const unsigned int digit = rest % radix;

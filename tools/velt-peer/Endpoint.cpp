@@ -4,6 +4,7 @@
 #include <netdb.h>
 #include <netinet/in.h>
 
+#include <array>
 #include <cctype>
 #include <cstring>
 #include <memory>
@@ -103,9 +104,9 @@ Endpoint Endpoint::LocalOf(int fd) {
   sockaddr_storage address{};
   socklen_t length = sizeof address;
   if (::getsockname(fd, reinterpret_cast<sockaddr*>(&address), &length) != 0) {
-    return Endpoint();
+    return {};
   }
-  return Endpoint(reinterpret_cast<const sockaddr*>(&address), length);
+  return {reinterpret_cast<const sockaddr*>(&address), length};
 }
 
 // The family-specific views are copied out rather than cast, so that no
@@ -125,18 +126,18 @@ std::uint16_t Endpoint::Port() const {
 }
 
 std::string Endpoint::ToString() const {
-  char text[INET6_ADDRSTRLEN] = {};
+  std::array<char, INET6_ADDRSTRLEN> text{};
   if (Family() == AF_INET) {
     sockaddr_in v4{};
     std::memcpy(&v4, &storage_, sizeof v4);
-    ::inet_ntop(AF_INET, &v4.sin_addr, text, sizeof text);
-    return std::string(text) + ":" + std::to_string(Port());
+    ::inet_ntop(AF_INET, &v4.sin_addr, text.data(), text.size());
+    return std::string(text.data()) + ":" + std::to_string(Port());
   }
   if (Family() == AF_INET6) {
     sockaddr_in6 v6{};
     std::memcpy(&v6, &storage_, sizeof v6);
-    ::inet_ntop(AF_INET6, &v6.sin6_addr, text, sizeof text);
-    return "[" + std::string(text) + "]:" + std::to_string(Port());
+    ::inet_ntop(AF_INET6, &v6.sin6_addr, text.data(), text.size());
+    return "[" + std::string(text.data()) + "]:" + std::to_string(Port());
   }
   return "?";
 }

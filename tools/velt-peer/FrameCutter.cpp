@@ -110,6 +110,15 @@ std::size_t FrameCutter::ResumePoint(std::size_t markerSize) const {
   return std::max(from, prefix_.size());
 }
 
+std::size_t FrameCutter::DatagramFrameEnd(const std::string& datagram,
+                                          std::size_t bodyStart) const {
+  if (suffix_.empty()) {
+    return std::min(datagram.find(prefix_, bodyStart), datagram.size());
+  }
+  const std::size_t found = datagram.find(suffix_, bodyStart);
+  return found == std::string::npos ? std::string::npos : found + suffix_.size();
+}
+
 std::vector<std::string> FrameCutter::CutDatagram(const std::string& datagram) const {
   if (!Framed()) {
     return {datagram};
@@ -124,16 +133,9 @@ std::vector<std::string> FrameCutter::CutDatagram(const std::string& datagram) c
         break;
       }
     }
-    const std::size_t bodyStart = start + prefix_.size();
-    std::size_t end = datagram.size();
-    if (!suffix_.empty()) {
-      const std::size_t found = datagram.find(suffix_, bodyStart);
-      if (found == std::string::npos) {
-        break;
-      }
-      end = found + suffix_.size();
-    } else {
-      end = std::min(datagram.find(prefix_, bodyStart), datagram.size());
+    const std::size_t end = DatagramFrameEnd(datagram, start + prefix_.size());
+    if (end == std::string::npos) {
+      break;
     }
     frames.push_back(datagram.substr(start, end - start));
     position = end;

@@ -49,6 +49,10 @@ class FrameCutter {
   // Where the next search for a marker of the given size may begin so that a
   // marker split across two reads is still found.
   std::size_t ResumePoint(std::size_t markerSize) const;
+  // Datagram: where the frame whose body begins at bodyStart ends (one past
+  // its suffix, or the next prefix or the end without a suffix); npos when
+  // its suffix is missing.
+  std::size_t DatagramFrameEnd(const std::string& datagram, std::size_t bodyStart) const;
 
   const std::string prefix_;
   const std::string suffix_;

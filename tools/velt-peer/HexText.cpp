@@ -1,12 +1,13 @@
 #include "velt-peer/HexText.h"
 
+#include <string_view>
 #include <utility>
 
 namespace veltpeer {
 
 namespace {
 
-constexpr char kDigits[] = "0123456789ABCDEF";
+constexpr std::string_view kDigits = "0123456789ABCDEF";
 
 // The value of one hex digit, or -1.
 int DigitValue(char c) {

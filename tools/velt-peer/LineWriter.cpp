@@ -1,11 +1,11 @@
 #include "velt-peer/LineWriter.h"
 
-#include <limits.h>
 #include <poll.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
+#include <climits>
 
 namespace veltpeer {
 

@@ -129,7 +129,7 @@ std::string Peer::CheckOptions() const {
   if (tcp && o.emitCount != 0 && o.txPrefix.empty() && o.txSuffix.empty() && o.payload.empty()) {
     return "an emitted token must not be empty on tcp";
   }
-  return std::string();
+  return {};
 }
 
 std::string Peer::Bind() {
@@ -157,7 +157,7 @@ std::string Peer::Bind() {
     socket_.Reset();
     return what + local.ToString() + ": " + std::generic_category().message(reason);
   }
-  return std::string();
+  return {};
 }
 
 void Peer::Work(Endpoint fixedDestination) {

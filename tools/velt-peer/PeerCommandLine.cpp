@@ -3,7 +3,7 @@
 #include <sys/socket.h>
 
 #include <algorithm>
-#include <iterator>
+#include <array>
 #include <limits>
 
 #include "velt-peer/Endpoint.h"
@@ -25,19 +25,19 @@ constexpr double kMaxRate = 1000000;
 constexpr double kMinRate = 0.001;
 constexpr double kMaxSeconds = 31536000;
 
-constexpr const char* kValueOptions[] = {
+constexpr std::array<const char*, 19> kValueOptions = {
     "--bind",        "--port",           "--to",         "--rx-prefix",  "--rx-suffix",
     "--gap",         "--emit",           "--rate",       "--prefix",     "--suffix",
     "--payload",     "--payload-hex",    "--delay",      "--chunk",      "--chunk-delay",
     "--close-after", "--close-after-ms", "--exit-after", "--max-seconds"};
-constexpr const char* kFlagOptions[] = {"--echo", "--text", "--count"};
+constexpr std::array<const char*, 3> kFlagOptions = {"--echo", "--text", "--count"};
 
 template <std::size_t N>
-bool Listed(const std::string& name, const char* const (&names)[N]) {
-  return std::find(std::begin(names), std::end(names), name) != std::end(names);
+bool Listed(const std::string& name, const std::array<const char*, N>& names) {
+  return std::find(names.begin(), names.end(), name) != names.end();
 }
 
-constexpr char kUsage[] =
+constexpr const char* kUsage =
     R"(Usage: velt-peer tcp|udp [options]
 A device simulator for the Velt Conduit driver. With tcp it listens and
 serves one client at a time; with udp it binds one socket. It prints what

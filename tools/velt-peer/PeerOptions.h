@@ -19,23 +19,23 @@ struct PeerOptions {
   static constexpr std::uint64_t kForever = std::numeric_limits<std::uint64_t>::max();
 
   Transport transport = Transport::kTcp;
-  // Local address to bind: a numeric IPv4/IPv6 address or a host name.
-  std::string bindAddress = "127.0.0.1";
   // Local port; 0 lets the system pick a free one (see Peer::Started::port).
   std::uint16_t port = 0;
+  // Local address to bind: a numeric IPv4/IPv6 address or a host name.
+  std::string bindAddress = "127.0.0.1";
   // UDP only: fixed destination "HOST:PORT" of emitted datagrams. Empty: emit
   // to the sender of the last datagram received (nothing before the first).
   std::string to;
 
-  // Send every received frame back whole (TCP: on the connection; UDP: to its
-  // sender).
-  bool echo = false;
   // Markers that cut received data into frames. With neither, a TCP frame is
   // whatever one read returns and a UDP frame is one datagram.
   std::string rxPrefix;
   std::string rxSuffix;
   // With a prefix and no suffix, a TCP frame also ends after this much silence.
   int gapMs = 500;
+  // Send every received frame back whole (TCP: on the connection; UDP: to its
+  // sender).
+  bool echo = false;
 
   // Tokens to emit (kForever for no end); emitted frame = txPrefix + payload +
   // txSuffix, one per datagram for UDP. TCP emits while a client is connected,

@@ -13,7 +13,7 @@ std::string PeerOutput::Line(const PeerEvent& event) const {
                                          : "velt-peer: bound udp " + event.address;
   }
   if (countOnly_) {
-    return std::string();
+    return {};
   }
   switch (event.kind) {
     case PeerEvent::Kind::kConnected:
@@ -29,7 +29,7 @@ std::string PeerOutput::Line(const PeerEvent& event) const {
     case PeerEvent::Kind::kListening:
       break;
   }
-  return std::string();
+  return {};
 }
 
 std::string PeerOutput::TotalsLine(const PeerTotals& totals) {

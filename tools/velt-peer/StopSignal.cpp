@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <climits>
 #include <system_error>
@@ -30,8 +31,8 @@ int PollTimeout(StopSignal::Clock::time_point deadline) {
 }  // namespace
 
 bool StopSignal::Open(std::string& error) {
-  int ends[2] = {-1, -1};
-  if (::pipe2(ends, O_CLOEXEC | O_NONBLOCK) != 0) {
+  std::array<int, 2> ends = {-1, -1};
+  if (::pipe2(ends.data(), O_CLOEXEC | O_NONBLOCK) != 0) {
     error = std::string("cannot create the stop pipe: ") + std::generic_category().message(errno);
     return false;
   }
@@ -65,9 +66,9 @@ WaitResult StopSignal::Wait(int fd, short events, Clock::time_point until) const
     if (Raised()) {
       return WaitResult::kStopped;
     }
-    pollfd fds[2] = {{readEnd_.Get(), POLLIN, 0}, {fd, events, 0}};
+    std::array<pollfd, 2> fds = {{{readEnd_.Get(), POLLIN, 0}, {fd, events, 0}}};
     const nfds_t count = fd >= 0 ? 2 : 1;
-    const int ready = ::poll(fds, count, PollTimeout(deadline));
+    const int ready = ::poll(fds.data(), count, PollTimeout(deadline));
     if (ready < 0) {
       if (errno == EINTR) {
         continue;

@@ -57,7 +57,7 @@ std::string TcpService::Run() {
   for (;;) {
     if (context_.stop.Wait(listener_, POLLIN, StopSignal::Clock::time_point::max()) ==
         WaitResult::kStopped) {
-      return std::string();
+      return {};
     }
     sockaddr_storage client{};
     socklen_t length = sizeof client;
@@ -85,7 +85,7 @@ std::string TcpService::Run() {
     const TcpConnection::Outcome outcome = connection.Serve();
     context_.emitter.Pause();
     if (outcome == TcpConnection::Outcome::kEnd) {
-      return std::string();
+      return {};
     }
   }
 }

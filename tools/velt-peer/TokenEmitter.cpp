@@ -1,10 +1,12 @@
 #include "velt-peer/TokenEmitter.h"
 
+#include <string_view>
+
 namespace veltpeer {
 
 namespace {
 
-constexpr char kCounterPlaceholder[] = "{n}";
+constexpr std::string_view kCounterPlaceholder = "{n}";
 
 TokenEmitter::Clock::duration PeriodOf(double rate) {
   if (rate <= 0) {
@@ -53,9 +55,9 @@ std::string TokenEmitter::Payload(std::uint64_t number) const {
     }
     out.append(payload_, from, at - from);
     out += digits;
-    from = at + sizeof kCounterPlaceholder - 1;
+    from = at + kCounterPlaceholder.size();
   }
-  out.append(payload_, from, std::string::npos);
+  out.append(payload_, from);
   return out;
 }
 

@@ -3,6 +3,8 @@
 #include <poll.h>
 #include <sys/socket.h>
 
+#include <algorithm>
+
 namespace veltpeer {
 
 namespace {
@@ -53,16 +55,18 @@ bool UdpService::ReceiveOne() {
     context_.emitter.Begin(StopSignal::Clock::now());
   }
   const std::string datagram(buffer_.data(), static_cast<std::size_t>(received));
-  for (const std::string& frame : cutter_.CutDatagram(datagram)) {
-    context_.activity.FrameReceived(frame);
-    if (context_.options.echo && !Echo(frame)) {
-      return false;
-    }
-    if (context_.CountHandled()) {
-      return false;
-    }
+  const std::vector<std::string> frames = cutter_.CutDatagram(datagram);
+  // In order, stopping at the first frame after which the simulator is done.
+  return std::all_of(frames.begin(), frames.end(),
+                     [this](const std::string& frame) { return HandleFrame(frame); });
+}
+
+bool UdpService::HandleFrame(const std::string& frame) {
+  context_.activity.FrameReceived(frame);
+  if (context_.options.echo && !Echo(frame)) {
+    return false;
   }
-  return true;
+  return !context_.CountHandled();
 }
 
 bool UdpService::Echo(const std::string& frame) {

@@ -22,6 +22,7 @@ class UdpService {
  private:
   // Each returns false when the simulator is done.
   bool ReceiveOne();
+  bool HandleFrame(const std::string& frame);
   bool Echo(const std::string& frame);
   bool EmitOne();
   const Endpoint& Destination() const;

@@ -1,10 +1,10 @@
 // velt-peer: the device simulator's command-line program.
 
 #include <pthread.h>
-#include <signal.h>
 #include <unistd.h>
 
 #include <chrono>
+#include <csignal>
 #include <cstdio>
 #include <ctime>
 #include <string>
@@ -25,7 +25,10 @@ constexpr long kSignalPollNanoseconds = 50L * 1000 * 1000;
 // output that has fallen behind, once the run is over.
 constexpr std::chrono::seconds kOutputGrace{2};
 
-void PrintError(const std::string& text) { std::fprintf(stderr, "velt-peer: %s\n", text.c_str()); }
+// A failed write to standard error has nowhere left to be reported.
+void PrintError(const std::string& text) {
+  (void)std::fprintf(stderr, "velt-peer: %s\n", text.c_str());
+}
 
 // Waits until the simulator ends by itself or SIGINT/SIGTERM arrives. The
 // signals are blocked in every thread and taken here synchronously, so no
@@ -52,11 +55,12 @@ int main(int argc, char** argv) {
   veltpeer::PeerCommandLine commandLine;
   if (!commandLine.Parse(arguments)) {
     PrintError(commandLine.Error());
-    std::fputs("Try 'velt-peer --help'.\n", stderr);
+    (void)std::fputs("Try 'velt-peer --help'.\n", stderr);
     return kUsageError;
   }
   if (commandLine.GetAction() == veltpeer::PeerCommandLine::Action::kHelp) {
-    std::fputs(veltpeer::PeerCommandLine::Usage(), stdout);
+    // Best effort, as for the version line below.
+    (void)std::fputs(veltpeer::PeerCommandLine::Usage(), stdout);
     return 0;
   }
   if (commandLine.GetAction() == veltpeer::PeerCommandLine::Action::kVersion) {

@@ -34,7 +34,8 @@ XmlBlock Compile(const std::string& input) {
 
 int main(int argc, char** argv) {
   if (argc != 3) {
-    std::fputs("usage: velt-xmlblock INPUT.xml OUTPUT.cpp\n", stderr);
+    // A failed write to standard error has nowhere left to be reported.
+    (void)std::fputs("usage: velt-xmlblock INPUT.xml OUTPUT.cpp\n", stderr);
     return 2;
   }
   const std::string input = argv[1];
@@ -43,7 +44,7 @@ int main(int argc, char** argv) {
     const XmlBlock block = Compile(input);
     AtomicFile::Write(output, BlockSource::Render(block, BaseName(input)));
   } catch (const std::exception& error) {
-    std::fprintf(stderr, "velt-xmlblock: %s\n", error.what());
+    (void)std::fprintf(stderr, "velt-xmlblock: %s\n", error.what());
     return 1;
   }
   return 0;
