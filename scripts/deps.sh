@@ -4,7 +4,10 @@
 # prints the exact apt-get line to run.
 set -eu
 
-PACKAGES="cmake make g++ clang clang-format ninja-build zlib1g-dev libgtest-dev libgmock-dev"
+# libclang-rt-14-dev holds the sanitizer runtimes and libFuzzer (only
+# recommended by clang); libbenchmark-dev is Google Benchmark.
+PACKAGES="cmake make g++ clang clang-format ninja-build zlib1g-dev libgtest-dev libgmock-dev
+libclang-rt-14-dev libbenchmark-dev"
 
 if ! command -v dpkg-query >/dev/null 2>&1; then
   echo "deps: no dpkg-query here; assuming the tools and libraries are installed" >&2
