@@ -3,6 +3,9 @@
 #               and the demo once, after the default suite
 #   make build  builds the default preset only
 #   make demo   builds the default preset and runs velt-host's demo
+#   make bench  builds the default preset and runs the benchmarks (short runs)
+#   make fuzz   builds the fuzz preset and runs each fuzz target for
+#               FUZZ_SECONDS (default 20) from its seed corpus
 #   make format applies clang-format; make format-check only checks
 #   make tidy   runs clang-tidy on the default build and fails on any finding
 
@@ -13,7 +16,7 @@ export CMAKE_GENERATOR ?= $(if $(shell command -v ninja 2>/dev/null),Ninja,Unix 
 FORMAT_DIRS := src hostapi tests host tools bench fuzz examples
 FORMAT_FILES = $(shell find $(FORMAT_DIRS) -name '*.h' -o -name '*.cpp' 2>/dev/null | sort)
 
-.PHONY: test deps build demo run-demo format format-check tidy clean \
+.PHONY: test deps build demo run-demo bench fuzz format format-check tidy clean \
 	$(addprefix suite-,default asan tsan clang)
 
 test: deps format-check suite-default run-demo suite-asan suite-tsan
@@ -44,6 +47,15 @@ demo: build
 # The demo as a test: once, with the default suite's build.
 run-demo: suite-default
 	$(DEMO)
+
+bench: build
+	sh scripts/bench.sh build/default/bench
+
+FUZZ_SECONDS ?= 20
+fuzz: deps
+	cmake --preset fuzz
+	cmake --build --preset fuzz -j $(JOBS)
+	sh scripts/fuzz.sh build/fuzz $(FUZZ_SECONDS)
 
 format-check:
 	@clang-format --dry-run --Werror $(FORMAT_FILES)

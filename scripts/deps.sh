@@ -4,9 +4,11 @@
 # prints the exact apt-get line to run.
 set -eu
 
-# libclang-rt-14-dev holds clang's sanitizer runtimes, which clang only recommends;
-# libedit-dev gives velt-host's console line editing and history.
-PACKAGES="cmake make g++ clang libclang-rt-14-dev clang-format ninja-build pkg-config zlib1g-dev libedit-dev libgtest-dev libgmock-dev"
+# libclang-rt-14-dev holds clang's sanitizer runtimes and libFuzzer, which clang only
+# recommends; libedit-dev gives velt-host's console line editing and history;
+# libbenchmark-dev is Google Benchmark.
+PACKAGES="cmake make g++ clang libclang-rt-14-dev clang-format ninja-build pkg-config zlib1g-dev
+libedit-dev libgtest-dev libgmock-dev libbenchmark-dev"
 
 if ! command -v dpkg-query >/dev/null 2>&1; then
   echo "deps: no dpkg-query here; assuming the tools and libraries are installed" >&2

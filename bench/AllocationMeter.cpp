@@ -1,0 +1,6 @@
+#include "AllocationMeter.h"
+
+void AllocationMeter::Report(benchmark::State& state) const {
+  state.counters["allocs/iter"] =
+      benchmark::Counter(static_cast<double>(counter_.count()), benchmark::Counter::kAvgIterations);
+}

@@ -1,0 +1,13 @@
+#pragma once
+
+#include <cstdio>
+#include <cstdlib>
+
+// A property every input must keep. A broken one is reported like a crash,
+// so the fuzzer saves the input that broke it.
+inline void Require(bool holds, const char* property) {
+  if (!holds) {
+    std::fprintf(stderr, "property broken: %s\n", property);
+    std::abort();
+  }
+}

@@ -1,0 +1,24 @@
+#include "ScriptedChannel.h"
+
+ScriptedChannel::ScriptedChannel(const std::string& config, bool start) {
+  host_.Offer("IMultiTask2", &tasks_);
+  host_.Offer("ISocketFactory", &sockets_);
+  host_.Offer("IPermanentStorage", &storage_);
+  bound_ = module_.Init(&host_) == 1;
+  protocol_ = std::make_unique<Protocol_VELT>();
+  configured_ = protocol_->Config(config.c_str());
+  if (configured_ && start) {
+    protocol_->Start();
+  }
+}
+
+ScriptedChannel::~ScriptedChannel() {
+  protocol_->Stop();
+  protocol_.reset();
+  module_.Close();
+}
+
+void ScriptedChannel::Receive(const std::string& token) {
+  TokenQueue::Guard held(protocol_->getTokenQueue());
+  protocol_->addToken(held, token);
+}
