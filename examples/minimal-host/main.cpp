@@ -9,6 +9,7 @@
 #include <dlfcn.h>
 
 #include <algorithm>
+#include <array>
 #include <chrono>
 #include <cstdint>
 #include <cstdio>
@@ -36,7 +37,7 @@ constexpr std::chrono::milliseconds kPollInterval{20};
 // is 3072 characters, plus the terminating zero.
 constexpr int kTokenRoom = 4096;
 
-const char kUsageText[] =
+const char* const kUsageText =
     "usage: minimal-host [--plugin PATH] [--storage FILE] [--ident NAME] [--seconds N] CONFIG\n"
     "  Loads the plug-in, creates one channel from the configuration string CONFIG,\n"
     "  connects it and prints the tokens it receives for N seconds (default 5).\n"
@@ -98,9 +99,9 @@ std::string Printable(const std::string& bytes) {
     } else if (byte >= 0x20 && byte < 0x7F) {
       text += c;
     } else {
-      char escaped[8];
-      std::snprintf(escaped, sizeof escaped, "\\x%02X", byte);
-      text += escaped;
+      std::array<char, 8> escaped{};
+      std::snprintf(escaped.data(), escaped.size(), "\\x%02X", byte);
+      text += escaped.data();
     }
   }
   return text;
@@ -108,11 +109,11 @@ std::string Printable(const std::string& bytes) {
 
 // Reads an unsignedInt tag (4 bytes in the host's byte order).
 bool ReadNumber(IProtocol& channel, const ITag& tag, std::uint32_t& value) {
-  unsigned char bytes[4] = {};
-  if (!channel.Read(&tag, bytes)) {
+  std::array<unsigned char, 4> bytes{};
+  if (!channel.Read(&tag, bytes.data())) {
     return false;
   }
-  std::memcpy(&value, bytes, sizeof value);
+  std::memcpy(&value, bytes.data(), sizeof value);
   return true;
 }
 

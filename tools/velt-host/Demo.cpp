@@ -1,5 +1,6 @@
 #include "velt-host/Demo.h"
 
+#include <array>
 #include <exception>
 #include <iterator>
 #include <thread>
@@ -21,8 +22,8 @@ constexpr const char* kGap = "?SP_Gap?unsignedInt";
 constexpr const char* kToken = "?rx_token?string-32";
 // velt-peer's own tokens, sent as soon as the driver connects.
 constexpr int kPeerTokens = 2;
-constexpr const char* kSentTokens[] = {"hello", "velt conduit"};
-constexpr int kSentCount = static_cast<int>(sizeof kSentTokens / sizeof kSentTokens[0]);
+constexpr std::array<const char*, 2> kSentTokens = {"hello", "velt conduit"};
+constexpr int kSentCount = static_cast<int>(kSentTokens.size());
 constexpr const char* kUdpToken = "ping over udp";
 constexpr int kStagedGap = 250;
 
