@@ -54,13 +54,15 @@ struct Options {
 };
 
 int Fail(const std::string& what) {
-  std::fprintf(stderr, "minimal-host: %s\n", what.c_str());
+  // A failed write to standard error has nowhere left to be reported.
+  (void)std::fprintf(stderr, "minimal-host: %s\n", what.c_str());
   return kFailed;
 }
 
+// A progress line; if standard output is gone, the run goes on regardless.
 void Say(const std::string& line) {
-  std::printf("%s\n", line.c_str());
-  std::fflush(stdout);
+  (void)std::printf("%s\n", line.c_str());
+  (void)std::fflush(stdout);
 }
 
 bool ParseArguments(const std::vector<std::string>& arguments, Options& options) {
@@ -100,7 +102,8 @@ std::string Printable(const std::string& bytes) {
       text += c;
     } else {
       std::array<char, 8> escaped{};
-      std::snprintf(escaped.data(), escaped.size(), "\\x%02X", byte);
+      // "\xHH" of one byte always fits, so the length is not needed.
+      (void)std::snprintf(escaped.data(), escaped.size(), "\\x%02X", byte);
       text += escaped.data();
     }
   }
@@ -278,7 +281,8 @@ int Run(const Options& options) {
 int main(int argc, char** argv) {
   Options options;
   if (!ParseArguments(std::vector<std::string>(argv + 1, argv + argc), options)) {
-    std::fputs(kUsageText, stderr);
+    // A failed write to standard error has nowhere left to be reported.
+    (void)std::fputs(kUsageText, stderr);
     return kUsage;
   }
   try {

@@ -105,9 +105,10 @@ bool TerminalInput::Next(std::string& line) {
     text = el_gets(editor_.get(), &count);
   }
   if (text == nullptr || count <= 0 || signals_.Raised()) {
-    // The shell's prompt starts on a line of its own after the console's.
-    std::fputs("\n", stdout);
-    std::fflush(stdout);
+    // The shell's prompt starts on a line of its own after the console's; a
+    // terminal that no longer takes output has no one left to tell.
+    (void)std::fputs("\n", stdout);
+    (void)std::fflush(stdout);
     return false;
   }
   line.assign(text, static_cast<std::size_t>(count));

@@ -135,7 +135,8 @@ void Store(unsigned char* bytes, T value) {
 
 std::string Decimal(double value) {
   std::array<char, 64> text{};
-  std::snprintf(text.data(), text.size(), "%g", value);
+  // %g of any double fits, so the length is not needed.
+  (void)std::snprintf(text.data(), text.size(), "%g", value);
   return text.data();
 }
 
