@@ -1,9 +1,9 @@
 #include "velt-host/HostProgram.h"
 
-#include <signal.h>
 #include <unistd.h>
 
 #include <clocale>
+#include <csignal>
 #include <cstdlib>
 #include <exception>
 #include <memory>

@@ -2,12 +2,12 @@
 
 #include <poll.h>
 #include <pthread.h>
-#include <signal.h>
 #include <sys/signalfd.h>
 #include <unistd.h>
 
 #include <array>
 #include <cerrno>
+#include <csignal>
 #include <stdexcept>
 #include <string>
 #include <system_error>
