@@ -355,13 +355,13 @@ std::string TypedValue::TypeName(const ValueShape& shape) {
 
 std::string TypedValue::Format(const ValueShape& shape, const unsigned char* bytes) {
   if (shape.length <= 0) {
-    return std::string();
+    return {};
   }
   if (shape.type == ICU_STRING) {
     const void* const zero = std::memchr(bytes, 0, static_cast<std::size_t>(shape.length));
     const auto* const end =
         zero == nullptr ? bytes + shape.length : static_cast<const unsigned char*>(zero);
-    return std::string(reinterpret_cast<const char*>(bytes), reinterpret_cast<const char*>(end));
+    return {reinterpret_cast<const char*>(bytes), reinterpret_cast<const char*>(end)};
   }
   if (IsArray(shape.type)) {
     return FormatArray(shape, bytes);
