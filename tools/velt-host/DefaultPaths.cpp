@@ -44,8 +44,8 @@ std::string DefaultPaths::FolderOf(const std::string& path) {
 
 std::string DefaultPaths::PluginPath(const std::string& executableFolder) {
   const std::string folder = executableFolder.empty() ? std::string(".") : executableFolder;
-  const std::string beside = folder + "/" + kPluginFile;
-  const std::string installed = folder + "/../lib/" + kPluginFile;
+  std::string beside = folder + "/" + kPluginFile;
+  std::string installed = folder + "/../lib/" + kPluginFile;
   if (!Exists(beside) && Exists(installed)) {
     return installed;
   }

@@ -36,6 +36,13 @@ std::string Totals(const char* transport, const veltpeer::PeerTotals& totals) {
          " and sent " + Frames(totals.framesSent);
 }
 
+// Why a wait gave up: what did not happen in time, and what uri read instead.
+std::string Overdue(const std::string& what, const std::string& uri, const std::string& value,
+                    const std::string& expected) {
+  return "no " + what + " within " + std::to_string(Demo::kStepTimeout.count()) + " s (" + uri +
+         " reads " + value + ", not " + expected + ")";
+}
+
 }  // namespace
 
 Demo::Demo(std::string pluginPath, ConsoleOutput& output, StopSignals& signals)
@@ -79,8 +86,7 @@ bool Demo::WaitFor(Instance& instance, const std::string& uri, const std::string
       return Fail("interrupted");
     }
     if (std::chrono::steady_clock::now() >= deadline) {
-      return Fail("no " + what + " within " + std::to_string(kStepTimeout.count()) + " s (" + uri +
-                  " reads " + value + ", not " + expected + ")");
+      return Fail(Overdue(what, uri, value, expected));
     }
     std::this_thread::sleep_for(kPoll);
   }

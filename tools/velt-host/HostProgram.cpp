@@ -105,8 +105,7 @@ std::string HostProgram::StoragePath(const HostOptions& options) {
     }
     return options.storagePath;
   }
-  const std::string path =
-      DefaultPaths::StoragePath(std::getenv("XDG_STATE_HOME"), DefaultPaths::Home());
+  std::string path = DefaultPaths::StoragePath(std::getenv("XDG_STATE_HOME"), DefaultPaths::Home());
   if (path.empty()) {
     throw std::runtime_error(
         "no place for the storage file: neither XDG_STATE_HOME nor a home folder is known "
