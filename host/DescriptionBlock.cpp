@@ -77,7 +77,7 @@ bool DescriptionBlock::Inflate(const unsigned char* stream, std::size_t streamBy
     error_ = "zlib cannot start inflating";
     return false;
   }
-  z.next_in = const_cast<Bytef*>(stream);
+  z.next_in = stream;
   z.avail_in = static_cast<uInt>(streamBytes);
   std::vector<char> chunk(kChunkBytes);
   int status = Z_OK;
