@@ -134,6 +134,14 @@ bool WriteFlag(IProtocol& channel, const ITag& tag, bool value) {
   return channel.Write(&tag, &byte);
 }
 
+// The interface the plug-in hands out under name, or null. The name fixes
+// the type: host interfaces are found by name and converted with static_cast,
+// as IInterface declares no virtual function for a checked cast to use.
+template <typename Interface>
+Interface* CreateByName(IInterfaceFactory& plugin, const char* name) {
+  return static_cast<Interface*>(plugin.CreateInterface(name));
+}
+
 std::string LastError(const IProtocol& channel) {
   return std::string(channel.GetLastErrorString()) + " (error " +
          std::to_string(channel.GetLastError()) + ")";
@@ -228,8 +236,8 @@ int Run(const Options& options) {
 
   // 3. Bind: the module asks the host's factory for its services by name.
   //    Close gives them back; it must come after the last channel is deleted.
-  auto* const module = static_cast<IProtModule*>(plugin->CreateInterface("IProtModule"));
-  auto* const factory = static_cast<IProtocolFactory*>(plugin->CreateInterface("IProtocolFactory"));
+  auto* const module = CreateByName<IProtModule>(*plugin, "IProtModule");
+  auto* const factory = CreateByName<IProtocolFactory>(*plugin, "IProtocolFactory");
   if (module == nullptr || factory == nullptr) {
     return Fail("the plug-in offers no IProtModule or IProtocolFactory");
   }
