@@ -158,10 +158,13 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
   const bool terminal = ::isatty(STDIN_FILENO) == 1;
   if (terminal) {
     // The terminal's encoding, so that the line editor moves over whole
-    // characters. Set while this is the only thread: setlocale is not safe
-    // beside threads that use the locale. A locale the system does not have
-    // leaves "C", where every byte stands for itself, which the line editor
-    // handles as well.
+    // characters. A locale the system does not have leaves "C", where every
+    // byte stands for itself, which the line editor handles as well.
+    // A false positive: setlocale is not safe beside threads that use the
+    // locale, and none exists yet (the plug-in is loaded below). uselocale
+    // would set the encoding for this thread alone, so the plug-in's threads
+    // would see another locale than the console's.
+    // NOLINTNEXTLINE(concurrency-mt-unsafe)
     (void)std::setlocale(LC_CTYPE, "");
   }
   const std::string pluginPath = PluginPath(options);

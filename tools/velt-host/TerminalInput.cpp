@@ -55,6 +55,9 @@ int TerminalInput::ReadCharacter(editline* editor, wchar_t* character) {
       }
       return -1;
     }
+    // A false positive: mbrtowc shares hidden state between threads only
+    // when it is given none of its own; each editor passes its own decoder_.
+    // NOLINTNEXTLINE(concurrency-mt-unsafe)
     const std::size_t decoded = std::mbrtowc(character, &byte, 1, &self->decoder_);
     if (decoded == static_cast<std::size_t>(-2)) {
       continue;
