@@ -64,10 +64,10 @@ format-check:
 format:
 	clang-format -i $(FORMAT_FILES)
 
-# clang-tidy over the library (and through it hostapi/), the reference host
-# and the finished tools, with the checks of .clang-tidy; any finding fails.
-# Slow, so it is not part of make test.
-TIDY_DIRS := src host tools/velt-peer tools/xmlblock
+# clang-tidy over the library (and through it hostapi/), the reference host,
+# the tools and the example host, with the checks of .clang-tidy; any finding
+# fails. Slow, so it is not part of make test.
+TIDY_DIRS := src host tools/velt-peer tools/xmlblock tools/velt-host examples
 tidy: build
 	@command -v run-clang-tidy >/dev/null 2>&1 || \
 	  { echo "tidy: run-clang-tidy is missing; install the Debian package clang-tidy" >&2; exit 1; }

@@ -3,15 +3,17 @@
 #include <zlib.h>
 
 #include <cstring>
+#include <string_view>
 #include <vector>
 
 namespace {
 
-constexpr char kLengthKey[] = "compressedXML=";
-constexpr std::size_t kLengthKeyBytes = sizeof kLengthKey - 1;
+using namespace std::string_view_literals;
+
+constexpr std::string_view kLengthKey = "compressedXML=";
+constexpr std::size_t kLengthKeyBytes = kLengthKey.size();
 // "<<TAVU_XML_END>>" with its zero byte.
-constexpr char kTrailer[] = "<<TAVU_XML_END>>";
-constexpr std::size_t kTrailerBytes = sizeof kTrailer;
+constexpr std::string_view kTrailer = "<<TAVU_XML_END>>\0"sv;
 // More digits than any accepted length needs; a longer line is refused
 // before anything past it is read.
 constexpr std::size_t kMaxDigits = 9;
@@ -75,7 +77,7 @@ bool DescriptionBlock::Inflate(const unsigned char* stream, std::size_t streamBy
     error_ = "zlib cannot start inflating";
     return false;
   }
-  z.next_in = const_cast<Bytef*>(stream);
+  z.next_in = stream;
   z.avail_in = static_cast<uInt>(streamBytes);
   std::vector<char> chunk(kChunkBytes);
   int status = Z_OK;
@@ -111,7 +113,7 @@ bool DescriptionBlock::Inflate(const unsigned char* stream, std::size_t streamBy
 }
 
 bool DescriptionBlock::CheckTrailer(const char* trailer) {
-  if (std::memcmp(trailer, kTrailer, kTrailerBytes) != 0) {
+  if (std::memcmp(trailer, kTrailer.data(), kTrailer.size()) != 0) {
     error_ = "the description does not end with \"<<TAVU_XML_END>>\"";
     return false;
   }

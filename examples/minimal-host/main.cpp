@@ -9,6 +9,7 @@
 #include <dlfcn.h>
 
 #include <algorithm>
+#include <array>
 #include <chrono>
 #include <cstdint>
 #include <cstdio>
@@ -36,7 +37,7 @@ constexpr std::chrono::milliseconds kPollInterval{20};
 // is 3072 characters, plus the terminating zero.
 constexpr int kTokenRoom = 4096;
 
-const char kUsageText[] =
+const char* const kUsageText =
     "usage: minimal-host [--plugin PATH] [--storage FILE] [--ident NAME] [--seconds N] CONFIG\n"
     "  Loads the plug-in, creates one channel from the configuration string CONFIG,\n"
     "  connects it and prints the tokens it receives for N seconds (default 5).\n"
@@ -53,13 +54,15 @@ struct Options {
 };
 
 int Fail(const std::string& what) {
-  std::fprintf(stderr, "minimal-host: %s\n", what.c_str());
+  // A failed write to standard error has nowhere left to be reported.
+  (void)std::fprintf(stderr, "minimal-host: %s\n", what.c_str());
   return kFailed;
 }
 
+// A progress line; if standard output is gone, the run goes on regardless.
 void Say(const std::string& line) {
-  std::printf("%s\n", line.c_str());
-  std::fflush(stdout);
+  (void)std::printf("%s\n", line.c_str());
+  (void)std::fflush(stdout);
 }
 
 bool ParseArguments(const std::vector<std::string>& arguments, Options& options) {
@@ -98,9 +101,10 @@ std::string Printable(const std::string& bytes) {
     } else if (byte >= 0x20 && byte < 0x7F) {
       text += c;
     } else {
-      char escaped[8];
-      std::snprintf(escaped, sizeof escaped, "\\x%02X", byte);
-      text += escaped;
+      std::array<char, 8> escaped{};
+      // "\xHH" of one byte always fits, so the length is not needed.
+      (void)std::snprintf(escaped.data(), escaped.size(), "\\x%02X", byte);
+      text += escaped.data();
     }
   }
   return text;
@@ -108,11 +112,11 @@ std::string Printable(const std::string& bytes) {
 
 // Reads an unsignedInt tag (4 bytes in the host's byte order).
 bool ReadNumber(IProtocol& channel, const ITag& tag, std::uint32_t& value) {
-  unsigned char bytes[4] = {};
-  if (!channel.Read(&tag, bytes)) {
+  std::array<unsigned char, 4> bytes{};
+  if (!channel.Read(&tag, bytes.data())) {
     return false;
   }
-  std::memcpy(&value, bytes, sizeof value);
+  std::memcpy(&value, bytes.data(), sizeof value);
   return true;
 }
 
@@ -128,6 +132,14 @@ bool ReadFlag(IProtocol& channel, const ITag& tag, bool& value) {
 bool WriteFlag(IProtocol& channel, const ITag& tag, bool value) {
   const unsigned char byte = value ? 1 : 0;
   return channel.Write(&tag, &byte);
+}
+
+// The interface the plug-in hands out under name, or null. The name fixes
+// the type: host interfaces are found by name and converted with static_cast,
+// as IInterface declares no virtual function for a checked cast to use.
+template <typename Interface>
+Interface* CreateByName(IInterfaceFactory& plugin, const char* name) {
+  return static_cast<Interface*>(plugin.CreateInterface(name));
 }
 
 std::string LastError(const IProtocol& channel) {
@@ -224,8 +236,8 @@ int Run(const Options& options) {
 
   // 3. Bind: the module asks the host's factory for its services by name.
   //    Close gives them back; it must come after the last channel is deleted.
-  auto* const module = static_cast<IProtModule*>(plugin->CreateInterface("IProtModule"));
-  auto* const factory = static_cast<IProtocolFactory*>(plugin->CreateInterface("IProtocolFactory"));
+  auto* const module = CreateByName<IProtModule>(*plugin, "IProtModule");
+  auto* const factory = CreateByName<IProtocolFactory>(*plugin, "IProtocolFactory");
   if (module == nullptr || factory == nullptr) {
     return Fail("the plug-in offers no IProtModule or IProtocolFactory");
   }
@@ -277,7 +289,8 @@ int Run(const Options& options) {
 int main(int argc, char** argv) {
   Options options;
   if (!ParseArguments(std::vector<std::string>(argv + 1, argv + argc), options)) {
-    std::fputs(kUsageText, stderr);
+    // A failed write to standard error has nowhere left to be reported.
+    (void)std::fputs(kUsageText, stderr);
     return kUsage;
   }
   try {

@@ -4,6 +4,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <system_error>
 
@@ -26,9 +27,9 @@ bool ConfigFile::Read(const std::string& path, std::string& text, std::string& e
     return false;
   }
   std::string content;
-  char buffer[16384];
+  std::array<char, 16384> buffer{};
   for (;;) {
-    const ssize_t received = ::read(file.Get(), buffer, sizeof buffer);
+    const ssize_t received = ::read(file.Get(), buffer.data(), buffer.size());
     if (received < 0 && errno == EINTR) {
       continue;
     }
@@ -39,7 +40,7 @@ bool ConfigFile::Read(const std::string& path, std::string& text, std::string& e
     if (received == 0) {
       break;
     }
-    content.append(buffer, static_cast<std::size_t>(received));
+    content.append(buffer.data(), static_cast<std::size_t>(received));
     if (content.size() > kMaxBytes) {
       error = what + "larger than " + std::to_string(kMaxBytes) + " bytes";
       return false;

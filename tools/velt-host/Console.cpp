@@ -25,7 +25,7 @@ constexpr const char* kConnected = "?conn_stat?boolean";
 std::string Trim(const std::string& text) {
   const std::size_t begin = text.find_first_not_of(kBlanks);
   if (begin == std::string::npos) {
-    return std::string();
+    return {};
   }
   return text.substr(begin, text.find_last_not_of(kBlanks) - begin + 1);
 }
@@ -109,13 +109,27 @@ bool Console::RunDotCommand(const std::string& line) {
   const std::size_t end = line.find_first_of(kBlanks);
   const std::string command = line.substr(0, end);
   const std::string argument = end == std::string::npos ? std::string() : line.substr(end + 1);
-  if (command == ".help") return Help(argument);
-  if (command == ".list") return List(argument);
-  if (command == ".use") return Use(argument);
-  if (command == ".read") return Read(argument);
-  if (command == ".write") return Write(argument);
-  if (command == ".watch") return Watch(argument);
-  if (command == ".quit") return Quit(argument);
+  if (command == ".help") {
+    return Help(argument);
+  }
+  if (command == ".list") {
+    return List(argument);
+  }
+  if (command == ".use") {
+    return Use(argument);
+  }
+  if (command == ".read") {
+    return Read(argument);
+  }
+  if (command == ".write") {
+    return Write(argument);
+  }
+  if (command == ".watch") {
+    return Watch(argument);
+  }
+  if (command == ".quit") {
+    return Quit(argument);
+  }
   return Fail("unknown command '" + command + "' (.help lists the host's commands)");
 }
 

@@ -2,9 +2,11 @@
 
 namespace velthost {
 
+// A console whose output is gone (a reader that went away, a full disk) has
+// nowhere left to report that; the session goes on until its input ends.
 void ConsoleOutput::Write(std::FILE* file, const std::string& text) {
-  std::fwrite(text.data(), 1, text.size(), file);
-  std::fflush(file);
+  (void)std::fwrite(text.data(), 1, text.size(), file);
+  (void)std::fflush(file);
 }
 
 void ConsoleOutput::Reply(const std::string& text) {

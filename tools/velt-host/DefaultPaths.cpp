@@ -29,7 +29,7 @@ std::string DefaultPaths::ExecutableFolder() {
   std::vector<char> path(4096);
   const ssize_t length = ::readlink("/proc/self/exe", path.data(), path.size());
   if (length <= 0 || static_cast<std::size_t>(length) >= path.size()) {
-    return std::string();
+    return {};
   }
   return FolderOf(std::string(path.data(), static_cast<std::size_t>(length)));
 }
@@ -44,8 +44,8 @@ std::string DefaultPaths::FolderOf(const std::string& path) {
 
 std::string DefaultPaths::PluginPath(const std::string& executableFolder) {
   const std::string folder = executableFolder.empty() ? std::string(".") : executableFolder;
-  const std::string beside = folder + "/" + kPluginFile;
-  const std::string installed = folder + "/../lib/" + kPluginFile;
+  std::string beside = folder + "/" + kPluginFile;
+  std::string installed = folder + "/../lib/" + kPluginFile;
   if (!Exists(beside) && Exists(installed)) {
     return installed;
   }
@@ -57,7 +57,7 @@ std::string DefaultPaths::StoragePath(const char* stateHome, const std::string& 
     return std::string(stateHome) + "/velt/storage.ini";
   }
   if (home.empty()) {
-    return std::string();
+    return {};
   }
   return home + "/.local/state/velt/storage.ini";
 }
@@ -74,7 +74,7 @@ std::string DefaultPaths::Home() {
       found != nullptr && found->pw_dir != nullptr) {
     return found->pw_dir;
   }
-  return std::string();
+  return {};
 }
 
 bool DefaultPaths::MakeFolders(const std::string& folder, std::string& error) {

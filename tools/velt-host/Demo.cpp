@@ -1,5 +1,6 @@
 #include "velt-host/Demo.h"
 
+#include <array>
 #include <exception>
 #include <iterator>
 #include <thread>
@@ -21,8 +22,8 @@ constexpr const char* kGap = "?SP_Gap?unsignedInt";
 constexpr const char* kToken = "?rx_token?string-32";
 // velt-peer's own tokens, sent as soon as the driver connects.
 constexpr int kPeerTokens = 2;
-constexpr const char* kSentTokens[] = {"hello", "velt conduit"};
-constexpr int kSentCount = static_cast<int>(sizeof kSentTokens / sizeof kSentTokens[0]);
+constexpr std::array<const char*, 2> kSentTokens = {"hello", "velt conduit"};
+constexpr int kSentCount = static_cast<int>(kSentTokens.size());
 constexpr const char* kUdpToken = "ping over udp";
 constexpr int kStagedGap = 250;
 
@@ -33,6 +34,13 @@ std::string Frames(std::uint64_t count) {
 std::string Totals(const char* transport, const veltpeer::PeerTotals& totals) {
   return std::string("velt-peer ") + transport + " received " + Frames(totals.framesReceived) +
          " and sent " + Frames(totals.framesSent);
+}
+
+// Why a wait gave up: what did not happen in time, and what uri read instead.
+std::string Overdue(const std::string& what, const std::string& uri, const std::string& value,
+                    const std::string& expected) {
+  return "no " + what + " within " + std::to_string(Demo::kStepTimeout.count()) + " s (" + uri +
+         " reads " + value + ", not " + expected + ")";
 }
 
 }  // namespace
@@ -78,8 +86,7 @@ bool Demo::WaitFor(Instance& instance, const std::string& uri, const std::string
       return Fail("interrupted");
     }
     if (std::chrono::steady_clock::now() >= deadline) {
-      return Fail("no " + what + " within " + std::to_string(kStepTimeout.count()) + " s (" + uri +
-                  " reads " + value + ", not " + expected + ")");
+      return Fail(Overdue(what, uri, value, expected));
     }
     std::this_thread::sleep_for(kPoll);
   }

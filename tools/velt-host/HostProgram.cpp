@@ -1,9 +1,9 @@
 #include "velt-host/HostProgram.h"
 
-#include <signal.h>
 #include <unistd.h>
 
 #include <clocale>
+#include <csignal>
 #include <cstdlib>
 #include <exception>
 #include <memory>
@@ -40,21 +40,25 @@ std::string Join(const std::vector<std::unique_ptr<Instance>>& instances) {
 int HostProgram::Run(const std::vector<std::string>& arguments) {
   HostCommandLine commandLine;
   if (!commandLine.Parse(arguments)) {
-    std::fprintf(err_, "velt-host: %s\nTry 'velt-host --help'.\n", commandLine.Error().c_str());
+    // A failed write to standard error has nowhere left to be reported.
+    (void)std::fprintf(err_, "velt-host: %s\nTry 'velt-host --help'.\n",
+                       commandLine.Error().c_str());
     return kBadCommandLine;
   }
   const HostOptions& options = commandLine.Options();
   if (options.action == Action::kHelp) {
-    std::fputs(HostCommandLine::Usage(), out_);
+    // Best effort, as for the version line below.
+    (void)std::fputs(HostCommandLine::Usage(), out_);
     return kSucceeded;
   }
   if (options.action == Action::kVersion) {
-    std::fprintf(out_, "%s\n", HostCommandLine::Version().c_str());
+    (void)std::fprintf(out_, "%s\n", HostCommandLine::Version().c_str());
     return kSucceeded;
   }
   // A reader that goes away must not kill velt-host before it has stopped
-  // its instances; the failed write is enough.
-  ::signal(SIGPIPE, SIG_IGN);
+  // its instances; the failed write is enough. signal fails only for a
+  // signal number that does not exist.
+  (void)::signal(SIGPIPE, SIG_IGN);
   ConsoleOutput output(out_, err_, options.quiet);
   try {
     StopSignals signals;
@@ -101,8 +105,7 @@ std::string HostProgram::StoragePath(const HostOptions& options) {
     }
     return options.storagePath;
   }
-  const std::string path =
-      DefaultPaths::StoragePath(std::getenv("XDG_STATE_HOME"), DefaultPaths::Home());
+  std::string path = DefaultPaths::StoragePath(std::getenv("XDG_STATE_HOME"), DefaultPaths::Home());
   if (path.empty()) {
     throw std::runtime_error(
         "no place for the storage file: neither XDG_STATE_HOME nor a home folder is known "
@@ -155,9 +158,14 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
   const bool terminal = ::isatty(STDIN_FILENO) == 1;
   if (terminal) {
     // The terminal's encoding, so that the line editor moves over whole
-    // characters. Set while this is the only thread: setlocale is not safe
-    // beside threads that use the locale.
-    std::setlocale(LC_CTYPE, "");
+    // characters. A locale the system does not have leaves "C", where every
+    // byte stands for itself, which the line editor handles as well.
+    // A false positive: setlocale is not safe beside threads that use the
+    // locale, and none exists yet (the plug-in is loaded below). uselocale
+    // would set the encoding for this thread alone, so the plug-in's threads
+    // would see another locale than the console's.
+    // NOLINTNEXTLINE(concurrency-mt-unsafe)
+    (void)std::setlocale(LC_CTYPE, "");
   }
   const std::string pluginPath = PluginPath(options);
   const std::string storagePath = StoragePath(options);

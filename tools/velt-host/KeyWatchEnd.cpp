@@ -2,6 +2,8 @@
 
 #include <unistd.h>
 
+#include <array>
+
 namespace velthost {
 
 KeyWatchEnd::KeyWatchEnd(int fd, StopSignals& signals) : fd_(fd), signals_(signals), keys_(fd) {}
@@ -18,8 +20,8 @@ WatchEnd::Event KeyWatchEnd::Wait(std::chrono::milliseconds timeout) {
   if (event == StopSignals::Event::kTimeout) {
     return Event::kNone;
   }
-  char keys[64];
-  const ssize_t received = ::read(fd_, keys, sizeof keys);
+  std::array<char, 64> keys{};
+  const ssize_t received = ::read(fd_, keys.data(), keys.size());
   if (received == 0) {
     // The terminal hung up: no key can come any more.
     ended_ = true;

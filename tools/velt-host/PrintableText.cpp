@@ -1,9 +1,11 @@
 #include "velt-host/PrintableText.h"
 
+#include <string_view>
+
 namespace velthost {
 
 std::string PrintableText::Escape(const std::string& bytes) {
-  static const char kDigits[] = "0123456789ABCDEF";
+  constexpr std::string_view kDigits = "0123456789ABCDEF";
   std::string text;
   text.reserve(bytes.size());
   for (const char c : bytes) {

@@ -2,11 +2,12 @@
 
 #include <poll.h>
 #include <pthread.h>
-#include <signal.h>
 #include <sys/signalfd.h>
 #include <unistd.h>
 
+#include <array>
 #include <cerrno>
+#include <csignal>
 #include <stdexcept>
 #include <string>
 #include <system_error>
@@ -40,10 +41,10 @@ StopSignals::Event StopSignals::Wait(int fd, std::chrono::milliseconds timeout) 
   if (Raised()) {
     return Event::kSignal;
   }
-  pollfd entries[2] = {{fd_.Get(), POLLIN, 0}, {fd, POLLIN, 0}};
+  std::array<pollfd, 2> entries = {{{fd_.Get(), POLLIN, 0}, {fd, POLLIN, 0}}};
   const nfds_t count = fd < 0 ? 1 : 2;
   const int ready =
-      ::poll(entries, count, timeout.count() < 0 ? -1 : static_cast<int>(timeout.count()));
+      ::poll(entries.data(), count, timeout.count() < 0 ? -1 : static_cast<int>(timeout.count()));
   if (Raised()) {
     return Event::kSignal;
   }

@@ -2,6 +2,7 @@
 
 #include <unistd.h>
 
+#include <array>
 #include <cerrno>
 
 namespace velthost {
@@ -40,10 +41,10 @@ StopSignals::Event StreamInput::Fill(std::chrono::milliseconds timeout) {
   if (event != StopSignals::Event::kInput) {
     return event;
   }
-  char buffer[kReadBytes];
-  const ssize_t received = ::read(fd_, buffer, sizeof buffer);
+  std::array<char, kReadBytes> buffer{};
+  const ssize_t received = ::read(fd_, buffer.data(), buffer.size());
   if (received > 0) {
-    pending_.append(buffer, static_cast<std::size_t>(received));
+    pending_.append(buffer.data(), static_cast<std::size_t>(received));
   } else if (received == 0 || (errno != EINTR && errno != EAGAIN)) {
     ended_ = true;
   }

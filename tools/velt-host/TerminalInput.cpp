@@ -55,6 +55,9 @@ int TerminalInput::ReadCharacter(editline* editor, wchar_t* character) {
       }
       return -1;
     }
+    // A false positive: mbrtowc shares hidden state between threads only
+    // when it is given none of its own; each editor passes its own decoder_.
+    // NOLINTNEXTLINE(concurrency-mt-unsafe)
     const std::size_t decoded = std::mbrtowc(character, &byte, 1, &self->decoder_);
     if (decoded == static_cast<std::size_t>(-2)) {
       continue;
@@ -105,9 +108,10 @@ bool TerminalInput::Next(std::string& line) {
     text = el_gets(editor_.get(), &count);
   }
   if (text == nullptr || count <= 0 || signals_.Raised()) {
-    // The shell's prompt starts on a line of its own after the console's.
-    std::fputs("\n", stdout);
-    std::fflush(stdout);
+    // The shell's prompt starts on a line of its own after the console's; a
+    // terminal that no longer takes output has no one left to tell.
+    (void)std::fputs("\n", stdout);
+    (void)std::fflush(stdout);
     return false;
   }
   line.assign(text, static_cast<std::size_t>(count));

@@ -1,5 +1,6 @@
 #include "velt-host/TypedValue.h"
 
+#include <array>
 #include <cerrno>
 #include <cfloat>
 #include <cmath>
@@ -7,6 +8,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <string_view>
 
 namespace velthost {
 
@@ -14,14 +16,15 @@ namespace {
 
 // The host's data-type texts, indexed by ICU_Type; a text ending in "-"
 // takes a count.
-const char* const kTypeNames[] = {"",       "boolean",       "byte",           "short",
-                                  "int",    "unsignedByte",  "unsignedShort",  "unsignedInt",
-                                  "float",  "double",        "string-",        "binary-",
-                                  "time",   "boolean-",      "byte-",          "short-",
-                                  "int-",   "unsignedByte-", "unsignedShort-", "unsignedInt-",
-                                  "float-", "double-",       "time-",          "uint64",
-                                  "int64",  "uint64-",       "int64-",         "object"};
-constexpr int kTypeCount = static_cast<int>(sizeof kTypeNames / sizeof kTypeNames[0]);
+constexpr std::array<const char*, ICU_OBJECT + 1> kTypeNames = {
+    "",       "boolean",       "byte",           "short",
+    "int",    "unsignedByte",  "unsignedShort",  "unsignedInt",
+    "float",  "double",        "string-",        "binary-",
+    "time",   "boolean-",      "byte-",          "short-",
+    "int-",   "unsignedByte-", "unsignedShort-", "unsignedInt-",
+    "float-", "double-",       "time-",          "uint64",
+    "int64",  "uint64-",       "int64-",         "object"};
+constexpr int kTypeCount = static_cast<int>(kTypeNames.size());
 
 // Bytes of one item of a scalar type; 0 for texts, arrays and unknown types.
 int ScalarBytes(ICU_Type type) {
@@ -81,7 +84,7 @@ ICU_Type ItemType(const ValueShape& shape) {
 }
 
 std::string Hex(const unsigned char* bytes, int count) {
-  static const char kDigits[] = "0123456789abcdef";
+  constexpr std::string_view kDigits = "0123456789abcdef";
   std::string text;
   for (int i = 0; i < count; ++i) {
     text += kDigits[bytes[i] >> 4U];
@@ -131,9 +134,10 @@ void Store(unsigned char* bytes, T value) {
 }
 
 std::string Decimal(double value) {
-  char text[64];
-  std::snprintf(text, sizeof text, "%g", value);
-  return text;
+  std::array<char, 64> text{};
+  // %g of any double fits, so the length is not needed.
+  (void)std::snprintf(text.data(), text.size(), "%g", value);
+  return text.data();
 }
 
 std::string FormatScalar(ICU_Type type, const unsigned char* bytes) {
@@ -351,13 +355,13 @@ std::string TypedValue::TypeName(const ValueShape& shape) {
 
 std::string TypedValue::Format(const ValueShape& shape, const unsigned char* bytes) {
   if (shape.length <= 0) {
-    return std::string();
+    return {};
   }
   if (shape.type == ICU_STRING) {
     const void* const zero = std::memchr(bytes, 0, static_cast<std::size_t>(shape.length));
     const auto* const end =
         zero == nullptr ? bytes + shape.length : static_cast<const unsigned char*>(zero);
-    return std::string(reinterpret_cast<const char*>(bytes), reinterpret_cast<const char*>(end));
+    return {reinterpret_cast<const char*>(bytes), reinterpret_cast<const char*>(end)};
   }
   if (IsArray(shape.type)) {
     return FormatArray(shape, bytes);
