@@ -505,8 +505,8 @@ void Protocol_VELT::receiveStream(ISocket* sock) {
 }
 
 void Protocol_VELT::addToken(TokenQueue::Guard& held, const std::string& token) {
-  const ChannelSettings current = settings.Get();
-  held.Add(token, static_cast<unsigned int>(current.tokenQueueSize), current.hexTokens);
+  const SettingsStore::QueueRules rules = settings.GetQueueRules();
+  held.Add(token, static_cast<unsigned int>(rules.tokenQueueSize), rules.hexTokens);
 }
 
 // ---------------------------------------------------------------------------
@@ -617,7 +617,7 @@ bool Protocol_VELT::doReadBlock(const Tag_VELT* tag, int /*index*/, unsigned cha
   const int room = roomOf(tag, count);
   if (tag->getIsRuntimeParameter()) {
     const RuntimeParameter* const parameter =
-        RuntimeParameter::ForMemoryType(tag->getMemoryType()->getName());
+        RuntimeParameter::ForMemoryType(*tag->getMemoryType());
     if (parameter != nullptr) {
       return readParameter(tag, *parameter, data, room);
     }
@@ -628,9 +628,9 @@ bool Protocol_VELT::doReadBlock(const Tag_VELT* tag, int /*index*/, unsigned cha
 
 bool Protocol_VELT::readChannel(TokenQueue::Guard& held, const Tag_VELT* tag, unsigned char* data,
                                 int room) {
-  const std::string name = tag->getMemoryType()->getName();
-  const int naturalLength = ProtUtilsN::GetDataLength(tag->getMemoryType()->getNaturalType());
-  if (name == "rx_token") {
+  const MemoryType& type = *tag->getMemoryType();
+  const int naturalLength = ProtUtilsN::GetDataLength(type.getNaturalType());
+  if (type.hasName("rx_token")) {
     if (held.Empty()) {
       data[0] = 0;
       return true;
@@ -643,24 +643,24 @@ bool Protocol_VELT::readChannel(TokenQueue::Guard& held, const Tag_VELT* tag, un
     }
     return true;
   }
-  if (name == "rx_token_len") {
+  if (type.hasName("rx_token_len")) {
     PutInteger(data, room, naturalLength,
                held.Empty() ? 0 : static_cast<std::int64_t>(held.Front().size()));
     return true;
   }
-  if (name == "tokens_available") {
+  if (type.hasName("tokens_available")) {
     PutInteger(data, room, naturalLength, static_cast<std::int64_t>(held.Size()));
     return true;
   }
-  if (name == "token_ack" || name == "tx_token") {
+  if (type.hasName("token_ack") || type.hasName("tx_token")) {
     data[0] = 0;
     return true;
   }
-  if (name == "conn_stat") {
+  if (type.hasName("conn_stat")) {
     data[0] = connected.load() ? 1 : 0;
     return true;
   }
-  if (name == "connect") {
+  if (type.hasName("connect")) {
     data[0] = connectRequested.load() ? 1 : 0;
     return true;
   }
@@ -799,7 +799,7 @@ bool Protocol_VELT::doWrite(const Tag_VELT* tag, int /*index*/, const unsigned c
   const int room = roomOf(tag, count) + 8;
   if (tag->getIsRuntimeParameter()) {
     const RuntimeParameter* const parameter =
-        RuntimeParameter::ForMemoryType(tag->getMemoryType()->getName());
+        RuntimeParameter::ForMemoryType(*tag->getMemoryType());
     if (parameter != nullptr) {
       return writeParameter(tag, *parameter, data, room);
     }
@@ -810,17 +810,17 @@ bool Protocol_VELT::doWrite(const Tag_VELT* tag, int /*index*/, const unsigned c
 
 bool Protocol_VELT::writeChannel(TokenQueue::Guard& held, const Tag_VELT* tag,
                                  const unsigned char* data, int room) {
-  const std::string name = tag->getMemoryType()->getName();
-  if (name == "token_ack") {
+  const MemoryType& type = *tag->getMemoryType();
+  if (type.hasName("token_ack")) {
     // The value written is not looked at: writing 0 acknowledges too.
     held.PopFront();
     return true;
   }
-  if (name == "connect") {
+  if (type.hasName("connect")) {
     connectRequested.store(data[0] != 0);
     return true;
   }
-  if (name == "tx_token") {
+  if (type.hasName("tx_token")) {
     std::string error;
     if (!sendToken(GetText(data, room), error)) {
       SetError(-1, error.c_str());

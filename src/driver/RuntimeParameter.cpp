@@ -1,5 +1,6 @@
 #include "driver/RuntimeParameter.h"
 
+#include <algorithm>
 #include <array>
 
 #include "protlib/HexText.h"
@@ -62,13 +63,12 @@ const std::array<const RuntimeParameter*, 14> kReloadOrder = {
 
 }  // namespace
 
-const RuntimeParameter* RuntimeParameter::ForMemoryType(const std::string& memoryType) {
-  for (const RuntimeParameter* parameter : kAll) {
-    if (memoryType == parameter->memoryType) {
-      return parameter;
-    }
-  }
-  return nullptr;
+const RuntimeParameter* RuntimeParameter::ForMemoryType(const MemoryType& memoryType) {
+  const auto* const found =
+      std::find_if(kAll.begin(), kAll.end(), [&memoryType](const RuntimeParameter* parameter) {
+        return memoryType.hasName(parameter->memoryType);
+      });
+  return found == kAll.end() ? nullptr : *found;
 }
 
 const RuntimeParameter* const* RuntimeParameter::ReloadOrder() { return kReloadOrder.data(); }

@@ -3,6 +3,7 @@
 #include <string>
 
 #include "driver/ChannelSettings.h"
+#include "memory/MemoryType.h"
 
 // One runtime parameter of the channel: the memory type that stages it, the
 // name under which it is staged, kept live and persisted, how its value is
@@ -27,7 +28,7 @@ struct RuntimeParameter {
   bool needsNewSocket;
 
   // The parameter staged by a memory type, or null.
-  static const RuntimeParameter* ForMemoryType(const std::string& memoryType);
+  static const RuntimeParameter* ForMemoryType(const MemoryType& memoryType);
   // Every parameter but the apply trigger, in the order in which an apply
   // reloads them; ended by null.
   static const RuntimeParameter* const* ReloadOrder();

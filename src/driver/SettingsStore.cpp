@@ -5,6 +5,11 @@ ChannelSettings SettingsStore::Get() const {
   return settings_;
 }
 
+SettingsStore::QueueRules SettingsStore::GetQueueRules() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return {settings_.tokenQueueSize, settings_.hexTokens};
+}
+
 void SettingsStore::Update(const std::function<void(ChannelSettings&)>& change) {
   const std::lock_guard<std::mutex> guard(lock_);
   change(settings_);

@@ -13,8 +13,16 @@
 // while another thread writes it and an idle pass copies nothing.
 class SettingsStore {
  public:
+  // The two settings that decide how a received token is queued.
+  struct QueueRules {
+    int tokenQueueSize;
+    bool hexTokens;
+  };
+
   // A consistent copy of the settings.
   ChannelSettings Get() const;
+  // The queue rules alone, without copying the texts (taken for every token).
+  QueueRules GetQueueRules() const;
   // Applies change to the settings under the lock.
   void Update(const std::function<void(ChannelSettings&)>& change);
   // Refreshes copy when the settings changed since it was taken; returns true

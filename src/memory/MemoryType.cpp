@@ -37,4 +37,4 @@ bool MemoryType::hasInternalConversion() const { return internalConversion; }
 int MemoryType::getMinIndex() const { return minIndex; }
 bool MemoryType::mustBitRead() const { return bitRead; }
 
-bool MemoryType::hasName(const std::string& value) const { return name == value; }
+bool MemoryType::hasName(std::string_view value) const { return name == value; }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <string_view>
 
 #include "HostTypes.h"
 
@@ -56,7 +57,7 @@ class MemoryType {
   bool mustBitRead() const;
 
   // Exact, case-sensitive comparison with the name, without copying it.
-  bool hasName(const std::string& value) const;
+  bool hasName(std::string_view value) const;
 
  private:
   std::string name;
