@@ -26,7 +26,7 @@ std::size_t DatagramFraming::Find(const std::string& marker, const unsigned char
 }
 
 void DatagramFraming::Split(const unsigned char* data, std::size_t length,
-                            const std::function<void(const std::string&)>& emit) const {
+                            const std::function<void(std::string)>& emit) const {
   std::size_t p = 0;
   do {
     if (!prefix_.empty()) {

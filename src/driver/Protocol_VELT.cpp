@@ -4,6 +4,7 @@
 #include <array>
 #include <cstdint>
 #include <cstring>
+#include <functional>
 #include <vector>
 
 #include "config/IPParser.h"
@@ -397,8 +398,10 @@ void Protocol_VELT::sleep(int milliseconds) {
 
 void Protocol_VELT::refreshWorkerSettings() {
   if (settings.Refresh(workerSettings, workerSettingsVersion)) {
-    workerRxPrefix = fromHex(workerSettings.rxPrefix);
-    workerRxSuffix = fromHex(workerSettings.rxSuffix);
+    const std::string prefix = fromHex(workerSettings.rxPrefix);
+    const std::string suffix = fromHex(workerSettings.rxSuffix);
+    workerDatagrams = DatagramFraming(prefix, suffix);
+    workerStream = StreamFraming(prefix, suffix);
   }
 }
 
@@ -478,35 +481,35 @@ void Protocol_VELT::Task() {
   }
 }
 
+void Protocol_VELT::queueToken(std::string token) {
+  TokenQueue::Guard held(tokenQueue);
+  addToken(held, std::move(token));
+}
+
 void Protocol_VELT::receiveDatagrams(ISocket* sock) {
-  const DatagramFraming framing(workerRxPrefix, workerRxSuffix);
-  const auto emit = [this](const std::string& token) {
-    TokenQueue::Guard held(tokenQueue);
-    addToken(held, token);
+  const std::function<void(std::string)> emit = [this](std::string token) {
+    queueToken(std::move(token));
   };
   for (;;) {
     const int received = sock->Receive(rxBuffer.data(), kRxBufferSize, kDatagramTimeout);
     if (received < 1) {
       return;
     }
-    framing.Split(rxBuffer.data(), static_cast<std::size_t>(std::min(received, kRxBufferSize)),
-                  emit);
+    workerDatagrams.Split(rxBuffer.data(),
+                          static_cast<std::size_t>(std::min(received, kRxBufferSize)), emit);
   }
 }
 
 void Protocol_VELT::receiveStream(ISocket* sock) {
   const int timeout = workerSettings.gap == 0 ? kDefaultGap : workerSettings.gap;
-  const StreamFraming framing(workerRxPrefix, workerRxSuffix);
-  framing.Pass([sock, timeout](unsigned char& byte) { return sock->Receive(&byte, 1, timeout); },
-               [this](const std::string& token) {
-                 TokenQueue::Guard held(tokenQueue);
-                 addToken(held, token);
-               });
+  workerStream.Pass(
+      [sock, timeout](unsigned char& byte) { return sock->Receive(&byte, 1, timeout); },
+      [this](std::string token) { queueToken(std::move(token)); });
 }
 
-void Protocol_VELT::addToken(TokenQueue::Guard& held, const std::string& token) {
+void Protocol_VELT::addToken(TokenQueue::Guard& held, std::string token) {
   const SettingsStore::QueueRules rules = settings.GetQueueRules();
-  held.Add(token, static_cast<unsigned int>(rules.tokenQueueSize), rules.hexTokens);
+  held.Add(std::move(token), static_cast<unsigned int>(rules.tokenQueueSize), rules.hexTokens);
 }
 
 // ---------------------------------------------------------------------------

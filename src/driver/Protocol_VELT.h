@@ -9,7 +9,9 @@
 #include "config/ParamManager.h"
 #include "config/ParameterReplacer.h"
 #include "driver/ChannelSettings.h"
+#include "driver/DatagramFraming.h"
 #include "driver/SettingsStore.h"
+#include "driver/StreamFraming.h"
 #include "driver/TaskRunner_VELT.h"
 #include "driver/TokenQueue.h"
 #include "memory/MemoryManager.h"
@@ -76,7 +78,7 @@ class Protocol_VELT final : public ProtocolBase {
   // (with the protocol's last error set) when none could be made.
   bool initSocket();
   // Appends a token under the queue's lock, held by the caller.
-  void addToken(TokenQueue::Guard& held, const std::string& token);
+  void addToken(TokenQueue::Guard& held, std::string token);
 
   // Answers one memory type into data (at most the room of count items).
   bool doReadBlock(const Tag_VELT* tag, int index, unsigned char* data, int count);
@@ -104,6 +106,8 @@ class Protocol_VELT final : public ProtocolBase {
   void refreshWorkerSettings();
   void supervise();
   bool connect();
+  // Appends a received token, taking the queue's lock for that one token.
+  void queueToken(std::string token);
   void receiveDatagrams(ISocket* sock);
   void receiveStream(ISocket* sock);
   void sendFrame(const std::string& frame);
@@ -150,6 +154,8 @@ class Protocol_VELT final : public ProtocolBase {
   int failedConnects = 0;
   ChannelSettings workerSettings;
   unsigned int workerSettingsVersion = 0;
-  std::string workerRxPrefix;
-  std::string workerRxSuffix;
+  // The framers for the current receive markers, made again only when the
+  // settings change, not on every pass.
+  DatagramFraming workerDatagrams{"", ""};
+  StreamFraming workerStream{"", ""};
 };

@@ -16,7 +16,8 @@ class StreamFraming {
   // Receives one byte into its argument; answers the receive's result
   // (below 1 for nothing received).
   using ReceiveByte = std::function<int(unsigned char&)>;
-  using Emit = std::function<void(const std::string&)>;
+  // Receives each token; the token is handed over, not copied.
+  using Emit = std::function<void(std::string)>;
 
   StreamFraming(std::string prefix, std::string suffix)
       : prefix_(std::move(prefix)), suffix_(std::move(suffix)) {}

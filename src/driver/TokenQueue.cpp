@@ -16,13 +16,13 @@ TokenQueue::Guard::~Guard() {
   }
 }
 
-void TokenQueue::Guard::Add(const std::string& token, unsigned int bound, bool hex) {
+void TokenQueue::Guard::Add(std::string token, unsigned int bound, bool hex) {
   auto& tokens = queue_.tokens_;
   if (!tokens.empty() && tokens.size() >= bound) {
     tokens.pop_front();
   }
   if (!hex) {
-    tokens.push_back(token);
+    tokens.push_back(std::move(token));
     return;
   }
   constexpr std::string_view kDigits = "0123456789ABCDEF";

@@ -27,7 +27,7 @@ class TokenQueue {
     // Appends a token; at the bound the oldest one is dropped first (an empty
     // queue drops nothing, so a bound of 0 keeps just the newest token). With
     // hex set the bytes are queued as upper-case hexadecimal text.
-    void Add(const std::string& token, unsigned int bound, bool hex);
+    void Add(std::string token, unsigned int bound, bool hex);
     bool Empty() const { return queue_.tokens_.empty(); }
     std::size_t Size() const { return queue_.tokens_.size(); }
     // The oldest token; the queue must not be empty.
