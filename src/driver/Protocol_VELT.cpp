@@ -678,32 +678,19 @@ bool Protocol_VELT::readParameter(const Tag_VELT* tag, const RuntimeParameter& p
   const std::lock_guard<std::mutex> guard(parametersLock);
   switch (parameter.kind) {
     case RuntimeParameter::Kind::Text: {
-      std::string value;
-      if (!stagedParams.get(parameter.name, -1, value)) {
-        liveParams.get(parameter.name, -1, current.*parameter.text, value);
-      }
-      if (!PutText(data, room, tag->GetVarLength(), value)) {
+      if (!PutText(data, room, tag->GetVarLength(),
+                   valueInForce(parameter, current.*parameter.text))) {
         SetError(-1, parameter.tooLongText);
         return false;
       }
       return true;
     }
-    case RuntimeParameter::Kind::Integer: {
-      int value = 0;
-      if (!stagedParams.get(parameter.name, -1, value)) {
-        liveParams.get(parameter.name, -1, current.*parameter.integer, value);
-      }
-      PutInteger(data, room, naturalLength, value);
+    case RuntimeParameter::Kind::Integer:
+      PutInteger(data, room, naturalLength, valueInForce(parameter, current.*parameter.integer));
       return true;
-    }
-    case RuntimeParameter::Kind::Boolean: {
-      bool value = false;
-      if (!stagedParams.get(parameter.name, -1, value)) {
-        liveParams.get(parameter.name, -1, current.*parameter.boolean, value);
-      }
-      data[0] = value ? 1 : 0;
+    case RuntimeParameter::Kind::Boolean:
+      data[0] = valueInForce(parameter, current.*parameter.boolean) ? 1 : 0;
       return true;
-    }
     case RuntimeParameter::Kind::Apply:
       data[0] = 0;
       return true;
@@ -865,6 +852,23 @@ bool Protocol_VELT::writeParameter(const Tag_VELT* tag, const RuntimeParameter& 
   return false;
 }
 
+template <typename Value>
+Value Protocol_VELT::valueInForce(const RuntimeParameter& parameter, const Value& working) {
+  Value value{};
+  if (!stagedParams.get(parameter.name, -1, value)) {
+    liveParams.get(parameter.name, -1, working, value);
+  }
+  return value;
+}
+
+template <typename Value>
+bool Protocol_VELT::reload(const RuntimeParameter& parameter, Value& setting) {
+  Value value = valueInForce(parameter, setting);
+  const bool changed = value != setting;
+  setting = std::move(value);
+  return changed;
+}
+
 bool Protocol_VELT::applyParameters() {
   TokenQueue::Guard held(tokenQueue);
   ChannelSettings applied = settings.Get();
@@ -876,25 +880,11 @@ bool Protocol_VELT::applyParameters() {
       const RuntimeParameter& parameter = **p;
       bool changed = false;
       if (parameter.text != nullptr) {
-        std::string value;
-        if (!stagedParams.get(parameter.name, -1, value)) {
-          liveParams.get(parameter.name, -1, applied.*parameter.text, value);
-        }
-        changed = value != applied.*parameter.text;
-        applied.*parameter.text = value;
+        changed = reload(parameter, applied.*parameter.text);
       } else if (parameter.integer != nullptr) {
-        int value = 0;
-        if (!stagedParams.get(parameter.name, -1, value)) {
-          liveParams.get(parameter.name, -1, applied.*parameter.integer, value);
-        }
-        changed = value != applied.*parameter.integer;
-        applied.*parameter.integer = value;
+        changed = reload(parameter, applied.*parameter.integer);
       } else if (parameter.boolean != nullptr) {
-        bool value = false;
-        if (!stagedParams.get(parameter.name, -1, value)) {
-          liveParams.get(parameter.name, -1, applied.*parameter.boolean, value);
-        }
-        applied.*parameter.boolean = value;
+        changed = reload(parameter, applied.*parameter.boolean);
       }
       renew = renew || (changed && parameter.needsNewSocket);
     }

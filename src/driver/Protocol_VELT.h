@@ -122,6 +122,14 @@ class Protocol_VELT final : public ProtocolBase {
                     int room);
   bool writeParameter(const Tag_VELT* tag, const RuntimeParameter& parameter,
                       const unsigned char* data, int room);
+  // The value of a runtime parameter in force: the staged one when there is
+  // one, else the live one (which falls back to working). The caller holds
+  // parametersLock.
+  template <typename Value>
+  Value valueInForce(const RuntimeParameter& parameter, const Value& working);
+  // Sets a working setting to its value in force; true when it changed.
+  template <typename Value>
+  bool reload(const RuntimeParameter& parameter, Value& setting);
   bool applyParameters();
   static int roomOf(const Tag_VELT* tag, int count);
 
