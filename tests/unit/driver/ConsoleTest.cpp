@@ -151,7 +151,6 @@ TEST_F(ConsoleTest, UnknownWordReachesTheBaseConsoleUnchanged) {
   EXPECT_FALSE(protocol->DoCommand("frobnicate now", output.data(), 32));
   EXPECT_EQ(std::string(output.begin(), output.end()), std::string(32, '#'));
   EXPECT_EQ(Command("lasterror"), "");
-  Command("connect");
   EXPECT_EQ(Command("getmaxtm"), "maxtm = 0 ms\n");
 }
 

@@ -1,5 +1,6 @@
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "DriverFixture.h"
 #include "driver/Tag_VELT.h"
@@ -154,6 +155,10 @@ TEST_F(TagTest, ConversionArgumentsAreKept) {
   auto tag = Direct("?rx_token?string-10(swap2, inv)");
   ASSERT_TRUE(tag->IsValid());
   EXPECT_EQ(tag->GetVarLength(), 10);
+  EXPECT_EQ(tag->GetConversions(), (std::vector<std::string>{"swap2", "inv"}));
+  std::unique_ptr<ITag> copy(tag->Clone());
+  EXPECT_EQ(dynamic_cast<Tag_VELT&>(*copy).GetConversions(),
+            (std::vector<std::string>{"swap2", "inv"}));
 }
 
 TEST_F(TagTest, CloneCopiesEveryFieldWithoutParsing) {
