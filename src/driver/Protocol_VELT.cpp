@@ -276,8 +276,6 @@ bool Protocol_VELT::Stop() {
   return true;
 }
 
-bool Protocol_VELT::initSocket() { return initSocket(settings.Get()); }
-
 bool Protocol_VELT::initSocket(const ChannelSettings& current) {
   const std::lock_guard<std::mutex> guard(socketLock);
   ISocketFactory2* const factory = piSocketFactory;

@@ -74,9 +74,9 @@ class Protocol_VELT final : public ProtocolBase {
   // One pass of the worker: supervises the connection, then receives and
   // frames what arrives.
   void Task();
-  // Replaces the socket with a new one made for the current settings; false
+  // Replaces the socket with a new one made for the given settings; false
   // (with the protocol's last error set) when none could be made.
-  bool initSocket();
+  bool initSocket(const ChannelSettings& current);
   // Appends a token under the queue's lock, held by the caller.
   void addToken(TokenQueue::Guard& held, std::string token);
 
@@ -102,7 +102,6 @@ class Protocol_VELT final : public ProtocolBase {
   TokenQueue& getTokenQueue() { return tokenQueue; }
 
  private:
-  bool initSocket(const ChannelSettings& current);
   void refreshWorkerSettings();
   void supervise();
   bool connect();
