@@ -606,9 +606,12 @@ TEST(DoConversionNeg, ItemReachingPastTheValueFails) {
   EXPECT_EQ(value, (Bytes{5, 0, 0x11, 0x22}));
 }
 
-TEST(TestTagBaseDouble, CloneCopiesConversionsAndErrorText) {
-  TestTagBase tag(ICU_SHORT, 2);
-  tag.setVarName("0?short(swap2)");
+TEST(TestTagBaseDouble, CloneCopiesEveryPropertyConversionsAndErrorText) {
+  TestTagBase tag(ICU_SHORT_ARRAY, 6, ICU_SHORT);
+  tag.setVarName("7?short-3(swap2)?2");
+  tag.setByteOffset(7);
+  tag.setBitIndex(2);
+  tag.setPackedLen(9);
   tag.setConversions({"swap2"});
   tag.SetError("old");
   const std::unique_ptr<ITag> copy(tag.Clone());
@@ -616,5 +619,21 @@ TEST(TestTagBaseDouble, CloneCopiesConversionsAndErrorText) {
   ASSERT_NE(base, nullptr);
   EXPECT_EQ(base->GetConversions(), std::vector<std::string>{"swap2"});
   EXPECT_EQ(base->GetError(), "old");
-  EXPECT_STREQ(base->GetVarName(), "0?short(swap2)");
+  EXPECT_STREQ(base->GetVarName(), "7?short-3(swap2)?2");
+  EXPECT_EQ(base->GetVarType(), ICU_SHORT_ARRAY);
+  EXPECT_EQ(base->GetItemType(), ICU_SHORT);
+  EXPECT_EQ(base->GetVarLength(), 6);
+  EXPECT_EQ(base->GetByteOffset(), 7);
+  EXPECT_EQ(base->GetBitIndex(), 2);
+  EXPECT_EQ(base->PackedLen(), 9);
+}
+
+TEST(TestTagBaseDouble, PackedLengthIsTheTagBasesUntilFixed) {
+  TestTagBase tag(ICU_BOOLEAN_ARRAY, 3, ICU_BOOLEAN);
+  tag.setBitIndex(6);
+  EXPECT_EQ(tag.PackedLen(), 2);
+  tag.setType(ICU_BYTE_ARRAY, 3, ICU_BYTE);
+  EXPECT_EQ(tag.PackedLen(), 3);
+  tag.setPackedLen(9);
+  EXPECT_EQ(tag.PackedLen(), 9);
 }
