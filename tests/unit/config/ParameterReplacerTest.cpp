@@ -171,9 +171,12 @@ TEST_F(ParameterReplacerTest, A256CharacterTextFailsAndGivesTheEmptyTextNotTheDe
 TEST_F(ParameterReplacerTest, AFailedTextReadGivesTheEmptyText) {
   storage.presetText(kSection, "socket_type", "TCP");
   storage.failStringReads(true);
-  std::string out;
+  std::string out = "untouched";
   live.get("socket_type", -1, "UDP", out);
   EXPECT_EQ(out, "");
+  EXPECT_EQ(storage.calls(), (Calls{{"HasValue", "P1", "socket_type", "1"},
+                                    {"ConvertTo", "", "IPermanentStorage2", ""},
+                                    {"GetStringValueInto", "P1", "socket_type", "256"}}));
 }
 
 TEST_F(ParameterReplacerTest, AnAbsentNameGivesTheDefaultWithoutAGetterCall) {

@@ -108,6 +108,8 @@ TEST(GetTAVUType, CountedTypesMultiplyItemLength) {
   EXPECT_EQ(p.length, 30);
   p = Parse("int64-2");
   EXPECT_TRUE(p.ok);
+  EXPECT_EQ(p.type, ICU_INT64_ARRAY);
+  EXPECT_EQ(p.itemType, ICU_INT64);
   EXPECT_EQ(p.length, 16);
 }
 
@@ -120,9 +122,12 @@ TEST(GetTAVUType, FixedTypesTakeRowLength) {
   p = Parse("object");
   EXPECT_TRUE(p.ok);
   EXPECT_EQ(p.type, ICU_OBJECT);
+  EXPECT_EQ(p.itemType, ICU_NONE);
   EXPECT_EQ(p.length, 0);
   p = Parse("time");
   EXPECT_TRUE(p.ok);
+  EXPECT_EQ(p.type, ICU_TIME);
+  EXPECT_EQ(p.itemType, ICU_NONE);
   EXPECT_EQ(p.length, 10);
 }
 

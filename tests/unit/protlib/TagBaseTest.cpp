@@ -214,7 +214,7 @@ TEST(TagBaseConvert, NamesAreCaseSensitive) {
   TestTagBase tag(ICU_SHORT, 2);
   tag.setConversions({"Swap2"});
   bool ok = true;
-  ToDevice(tag, {1, 2}, 0, &ok);
+  EXPECT_EQ(ToDevice(tag, {1, 2}, 0, &ok), (Bytes{0, 0}));
   EXPECT_FALSE(ok);
   EXPECT_EQ(tag.GetError(), "Conversion error at: Swap2");
 }
@@ -223,7 +223,7 @@ TEST(TagBaseConvert, FirstFailureStopsTheChain) {
   TestTagBase tag(ICU_STRING, 3, ICU_BYTE);
   tag.setConversions({"swap4", "swap2"});
   bool ok = true;
-  ToDevice(tag, {1, 2, 3}, 0, &ok);
+  EXPECT_EQ(ToDevice(tag, {1, 2, 3}, 0, &ok), (Bytes{0, 0, 0}));
   EXPECT_FALSE(ok);
   EXPECT_EQ(tag.GetError(), "Conversion error at: swap4");
 }
@@ -241,7 +241,9 @@ TEST(TagBaseConvert, NullBuffersFail) {
   unsigned char bytes[4] = {};
   EXPECT_FALSE(tag.Convert(nullptr, bytes, true));
   EXPECT_EQ(tag.GetError(), "Conversion error: no buffer");
+  tag.SetError(nullptr);
   EXPECT_FALSE(tag.Convert(bytes, nullptr, false));
+  EXPECT_EQ(tag.GetError(), "Conversion error: no buffer");
 }
 
 TEST(TagBaseConvert, NegativeLengthFails) {
@@ -492,7 +494,7 @@ TEST(DoConversionInv, IntFails) {
   EXPECT_EQ(value, (Bytes{1, 2, 3, 4}));
   tag.setConversions({"inv"});
   bool ok = true;
-  ToDevice(tag, value, 0, &ok);
+  EXPECT_EQ(ToDevice(tag, value, 0, &ok), (Bytes{0, 0, 0, 0}));
   EXPECT_FALSE(ok);
   EXPECT_EQ(tag.GetError(), "Conversion error at: inv");
 }
@@ -527,6 +529,7 @@ TEST(DoConversionInv, OtherTypesFail) {
   const TestTagBase text(ICU_STRING, 4, ICU_BYTE);
   Bytes value(4, 0x0F);
   EXPECT_FALSE(text.DoConversion(value.data(), "inv", true));
+  EXPECT_EQ(value, Bytes(4, 0x0F));
 }
 
 TEST(DoConversionNeg, ScalarIntFiveBecomesMinusFive) {
