@@ -41,34 +41,28 @@ void GroupParameterReplacer::set(const std::string& name, int node, int value) {
   stage(name, node, std::move(entry));
 }
 
-bool GroupParameterReplacer::get(const std::string& name, int node, std::string& out) const {
+template <typename T>
+bool GroupParameterReplacer::getTyped(const std::string& name, int node, std::int32_t type,
+                                      T Variant::*member, T& out) const {
   const std::lock_guard<std::mutex> lock(mutex);
-  const Variant* const entry = findTyped(name, node, ParameterReplacer::kString);
-  if (entry == nullptr) {
+  const auto found = values.find(makeFullName(name, node));
+  if (found == values.end() || found->second.type != type) {
     return false;
   }
-  out = entry->stringValue;
+  out = found->second.*member;
   return true;
+}
+
+bool GroupParameterReplacer::get(const std::string& name, int node, std::string& out) const {
+  return getTyped(name, node, ParameterReplacer::kString, &Variant::stringValue, out);
 }
 
 bool GroupParameterReplacer::get(const std::string& name, int node, int& out) const {
-  const std::lock_guard<std::mutex> lock(mutex);
-  const Variant* const entry = findTyped(name, node, ParameterReplacer::kInteger);
-  if (entry == nullptr) {
-    return false;
-  }
-  out = entry->intValue;
-  return true;
+  return getTyped(name, node, ParameterReplacer::kInteger, &Variant::intValue, out);
 }
 
 bool GroupParameterReplacer::get(const std::string& name, int node, bool& out) const {
-  const std::lock_guard<std::mutex> lock(mutex);
-  const Variant* const entry = findTyped(name, node, ParameterReplacer::kBoolean);
-  if (entry == nullptr) {
-    return false;
-  }
-  out = entry->boolValue;
-  return true;
+  return getTyped(name, node, ParameterReplacer::kBoolean, &Variant::boolValue, out);
 }
 
 void GroupParameterReplacer::activate(ParameterReplacer& live, int node, bool persist) const {
@@ -98,14 +92,4 @@ void GroupParameterReplacer::stage(const std::string& name, int node, Variant en
   const std::string fullName = makeFullName(name, node);
   const std::lock_guard<std::mutex> lock(mutex);
   values[fullName] = std::move(entry);
-}
-
-const GroupParameterReplacer::Variant* GroupParameterReplacer::findTyped(const std::string& name,
-                                                                         int node,
-                                                                         std::int32_t type) const {
-  const auto found = values.find(makeFullName(name, node));
-  if (found == values.end() || found->second.type != type) {
-    return nullptr;
-  }
-  return &found->second;
 }

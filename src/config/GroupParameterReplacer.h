@@ -64,8 +64,11 @@ class GroupParameterReplacer {
 
  private:
   void stage(const std::string& name, int node, Variant entry);
-  // The staged entry of the given type under the full name, or null.
-  const Variant* findTyped(const std::string& name, int node, std::int32_t type) const;
+  // The member of the entry staged under the full name, when that entry has
+  // the given type.
+  template <typename T>
+  bool getTyped(const std::string& name, int node, std::int32_t type, T Variant::*member,
+                T& out) const;
 
   mutable std::mutex mutex;
   std::map<std::string, Variant> values;

@@ -84,11 +84,11 @@ bool ParamManager::readOptional(CfgParser& parser) {
     return fail(error);
   }
   common.broadcastType = "Global";
-  // A TCP channel has no broadcast: the key is not even read then.
-  std::string socketType;
-  readParam(parser, "socketType", kAnyNode, socketType, kProtocolWide, kOptional, error);
-  if (socketType != "TCP" && !readParam(parser, "broadcastType", kAnyNode, common.broadcastType,
-                                        kProtocolWide, kOptional, error)) {
+  // A TCP channel has no broadcast: the key is not even read then. The
+  // socket type was read by this parse just before, from the same text.
+  if (common.socketType != "TCP" &&
+      !readParam(parser, "broadcastType", kAnyNode, common.broadcastType, kProtocolWide, kOptional,
+                 error)) {
     return fail(error);
   }
   if (!readWithDefault(parser, "rx_prefix", common.rx_prefix, "", error) ||

@@ -6,6 +6,7 @@
 #include <memory>
 #include <string_view>
 
+#include "protlib/HexText.h"
 #include "protlib/ProtocolBase.h"
 #include "protlib/ScratchBuffer.h"
 #include "protlib/TextUtils.h"
@@ -16,26 +17,12 @@ namespace {
 // allocation.
 constexpr std::size_t kValueBytes = 64;
 
-// The value of one hexadecimal digit, -1 for any other character.
-int HexDigit(char c) {
-  if (c >= '0' && c <= '9') {
-    return c - '0';
-  }
-  if (c >= 'A' && c <= 'F') {
-    return c - 'A' + 10;
-  }
-  if (c >= 'a' && c <= 'f') {
-    return c - 'a' + 10;
-  }
-  return -1;
-}
-
 // Decodes text (two digits per byte, high digit first) into bytes, which holds
 // text.size() / 2 bytes. False at the first character that is no digit.
 bool DecodeHex(const std::string& text, unsigned char* bytes) {
   for (std::size_t i = 0; i + 1 < text.size(); i += 2) {
-    const int high = HexDigit(text[i]);
-    const int low = HexDigit(text[i + 1]);
+    const int high = hexDigitValue(text[i]);
+    const int low = hexDigitValue(text[i + 1]);
     if (high < 0 || low < 0) {
       return false;
     }

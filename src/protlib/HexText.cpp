@@ -4,21 +4,27 @@
 
 namespace {
 
-bool isHexDigit(char c) {
-  return (c >= '0' && c <= '9') || (c >= 'A' && c <= 'F') || (c >= 'a' && c <= 'f');
+// A character of an unvalidated text: a digit's value, and any other
+// character read as a lower-case letter.
+int lenientDigitValue(char c) {
+  const int value = hexDigitValue(c);
+  return value >= 0 ? value : static_cast<unsigned char>(c) - 87;
 }
 
-int digitValue(char c) {
+}  // namespace
+
+int hexDigitValue(char c) {
   if (c >= '0' && c <= '9') {
     return c - '0';
   }
   if (c >= 'A' && c <= 'F') {
     return c - 'A' + 10;
   }
-  return static_cast<unsigned char>(c) - 87;
+  if (c >= 'a' && c <= 'f') {
+    return c - 'a' + 10;
+  }
+  return -1;
 }
-
-}  // namespace
 
 bool isHex(const char* text) {
   if (text == nullptr) {
@@ -32,7 +38,7 @@ bool isHex(const char* text) {
     return false;
   }
   for (std::size_t i = 0; i < length; ++i) {
-    if (!isHexDigit(text[i])) {
+    if (hexDigitValue(text[i]) < 0) {
       return false;
     }
   }
@@ -47,7 +53,7 @@ std::string fromHex(const std::string& text) {
   bytes.reserve(text.size() / 2);
   for (std::size_t i = 0; i + 1 < text.size(); i += 2) {
     // Reduced modulo 256, so unvalidated characters still give a defined byte.
-    const int value = (digitValue(text[i]) * 16 + digitValue(text[i + 1])) % 256;
+    const int value = (lenientDigitValue(text[i]) * 16 + lenientDigitValue(text[i + 1])) % 256;
     bytes.push_back(static_cast<char>(static_cast<unsigned char>(value < 0 ? value + 256 : value)));
   }
   return bytes;

@@ -5,6 +5,10 @@
 // Hexadecimal text as the driver keeps its framing markers and, in hex mode,
 // its tokens: two digits per byte, high digit first.
 
+// The value of one hexadecimal digit ('0'-'9', 'A'-'F', 'a'-'f'), -1 for any
+// other character.
+int hexDigitValue(char c);
+
 // True for "none", the empty text and any text of even length made only of
 // the digits 0-9 and the letters A-F in either case; false for everything
 // else (an odd length first of all) and for null.

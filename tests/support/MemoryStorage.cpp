@@ -29,27 +29,19 @@ IInterface* MemoryStorage::ConvertTo(const char* name) {
 void MemoryStorage::SetStringValue(const char* section, const char* name, const char* value) {
   const std::lock_guard<std::mutex> lock(mutex_);
   record("SetStringValue", section, name, value == nullptr ? "(null)" : value);
-  Stored stored;
-  stored.text = Text(value);
-  store(Text(section), Text(name), stored);
+  store(Text(section), Text(name), Stored::OfText(Text(value)));
 }
 
 void MemoryStorage::SetBoolValue(const char* section, const char* name, bool value) {
   const std::lock_guard<std::mutex> lock(mutex_);
   record("SetBoolValue", section, name, FlagText(value));
-  Stored stored;
-  stored.kind = Kind::Flag;
-  stored.flag = value;
-  store(Text(section), Text(name), stored);
+  store(Text(section), Text(name), Stored::OfFlag(value));
 }
 
 void MemoryStorage::SetIntValue(const char* section, const char* name, int value) {
   const std::lock_guard<std::mutex> lock(mutex_);
   record("SetIntValue", section, name, std::to_string(value));
-  Stored stored;
-  stored.kind = Kind::Number;
-  stored.number = value;
-  store(Text(section), Text(name), stored);
+  store(Text(section), Text(name), Stored::OfNumber(value));
 }
 
 const char* MemoryStorage::GetStringValue(const char* section, const char* name) {
@@ -107,25 +99,17 @@ int MemoryStorage::GetStringValueInto(const char* section, const char* name, cha
 void MemoryStorage::presetText(const std::string& section, const std::string& name,
                                const std::string& value) {
   const std::lock_guard<std::mutex> lock(mutex_);
-  Stored stored;
-  stored.text = value;
-  store(section, name, stored);
+  store(section, name, Stored::OfText(value));
 }
 
 void MemoryStorage::presetBool(const std::string& section, const std::string& name, bool value) {
   const std::lock_guard<std::mutex> lock(mutex_);
-  Stored stored;
-  stored.kind = Kind::Flag;
-  stored.flag = value;
-  store(section, name, stored);
+  store(section, name, Stored::OfFlag(value));
 }
 
 void MemoryStorage::presetInt(const std::string& section, const std::string& name, int value) {
   const std::lock_guard<std::mutex> lock(mutex_);
-  Stored stored;
-  stored.kind = Kind::Number;
-  stored.number = value;
-  store(section, name, stored);
+  store(section, name, Stored::OfNumber(value));
 }
 
 void MemoryStorage::failStringReads(bool fail) {
@@ -138,34 +122,30 @@ bool MemoryStorage::contains(const std::string& section, const std::string& name
   return values_.count(Key(section, name)) != 0;
 }
 
-std::optional<std::string> MemoryStorage::textValue(const std::string& section,
-                                                    const std::string& name) const {
+template <typename T>
+std::optional<T> MemoryStorage::storedAs(const std::string& section, const std::string& name,
+                                         Kind kind, T Stored::*member) const {
   const std::lock_guard<std::mutex> lock(mutex_);
   const auto found = values_.find(Key(section, name));
-  if (found == values_.end() || found->second.kind != Kind::Text) {
+  if (found == values_.end() || found->second.kind != kind) {
     return std::nullopt;
   }
-  return found->second.text;
+  return found->second.*member;
+}
+
+std::optional<std::string> MemoryStorage::textValue(const std::string& section,
+                                                    const std::string& name) const {
+  return storedAs(section, name, Kind::Text, &Stored::text);
 }
 
 std::optional<bool> MemoryStorage::boolValue(const std::string& section,
                                              const std::string& name) const {
-  const std::lock_guard<std::mutex> lock(mutex_);
-  const auto found = values_.find(Key(section, name));
-  if (found == values_.end() || found->second.kind != Kind::Flag) {
-    return std::nullopt;
-  }
-  return found->second.flag;
+  return storedAs(section, name, Kind::Flag, &Stored::flag);
 }
 
 std::optional<int> MemoryStorage::intValue(const std::string& section,
                                            const std::string& name) const {
-  const std::lock_guard<std::mutex> lock(mutex_);
-  const auto found = values_.find(Key(section, name));
-  if (found == values_.end() || found->second.kind != Kind::Number) {
-    return std::nullopt;
-  }
-  return found->second.number;
+  return storedAs(section, name, Kind::Number, &Stored::number);
 }
 
 std::size_t MemoryStorage::size() const {
@@ -214,4 +194,24 @@ const MemoryStorage::Stored* MemoryStorage::lookup(const char* section, const ch
 
 void MemoryStorage::store(const std::string& section, const std::string& name, Stored value) {
   values_[Key(section, name)] = std::move(value);
+}
+
+MemoryStorage::Stored MemoryStorage::Stored::OfText(std::string value) {
+  Stored stored;
+  stored.text = std::move(value);
+  return stored;
+}
+
+MemoryStorage::Stored MemoryStorage::Stored::OfFlag(bool value) {
+  Stored stored;
+  stored.kind = Kind::Flag;
+  stored.flag = value;
+  return stored;
+}
+
+MemoryStorage::Stored MemoryStorage::Stored::OfNumber(int value) {
+  Stored stored;
+  stored.kind = Kind::Number;
+  stored.number = value;
+  return stored;
 }

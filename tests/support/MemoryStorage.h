@@ -74,6 +74,10 @@ class MemoryStorage final : public IPermanentStorage2 {
     std::string text;
     bool flag = false;
     int number = 0;
+
+    static Stored OfText(std::string value);
+    static Stored OfFlag(bool value);
+    static Stored OfNumber(int value);
   };
   using Key = std::pair<std::string, std::string>;
 
@@ -81,6 +85,11 @@ class MemoryStorage final : public IPermanentStorage2 {
   void record(const char* operation, const char* section, const char* name, std::string value);
   const Stored* lookup(const char* section, const char* name) const;
   void store(const std::string& section, const std::string& name, Stored value);
+  // The member of the value stored under section and name, when it is of
+  // that kind.
+  template <typename T>
+  std::optional<T> storedAs(const std::string& section, const std::string& name, Kind kind,
+                            T Stored::*member) const;
 
   const Generation generation_;
   mutable std::mutex mutex_;

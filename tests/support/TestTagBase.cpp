@@ -16,3 +16,12 @@ void TestTagBase::setType(ICU_Type type, int length, ICU_Type item) {
   varLength = length;
   itemType = item;
 }
+
+int TestTagBase::PackedLen() const {
+  return packedLengthFixed ? packedLength : TagBase::PackedLen();
+}
+
+void TestTagBase::setPackedLen(int length) {
+  packedLength = length;
+  packedLengthFixed = true;
+}

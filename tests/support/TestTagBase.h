@@ -7,8 +7,9 @@
 #include "protlib/TagBase.h"
 
 // A tag on the framework's tag base whose address properties are set directly
-// by the test; packed length, conversion and the conversion chain are
-// TagBase's own. An optional counter records each destruction, so tests can
+// by the test; conversion and the conversion chain are TagBase's own, and so
+// is the packed length until setPackedLen fixes it (as a driver's tag may
+// answer its own). An optional counter records each destruction, so tests can
 // see how often a tag was deleted.
 class TestTagBase final : public TagBase {
  public:
@@ -27,11 +28,14 @@ class TestTagBase final : public TagBase {
   ICU_Type GetVarType() const override { return varType; }
   int GetVarLength() const override { return varLength; }
   ICU_Type GetItemType() const override { return itemType; }
+  int PackedLen() const override;
 
   void setVarName(const std::string& name) { varName = name; }
   void setType(ICU_Type type, int length, ICU_Type item = ICU_NONE);
   void setByteOffset(int offset) { byteOffset = offset; }
   void setBitIndex(int index) { bitIndex = index; }
+  // Fixes the packed length that PackedLen answers.
+  void setPackedLen(int length);
   void setConversions(std::initializer_list<std::string> names) { conversions = names; }
   // The list that a data-type text's parameters are appended to.
   std::vector<std::string>& conversionList() { return conversions; }
@@ -45,5 +49,7 @@ class TestTagBase final : public TagBase {
   ICU_Type itemType = ICU_NONE;
   int byteOffset = 0;
   int bitIndex = 0;
+  int packedLength = 0;
+  bool packedLengthFixed = false;
   int* deletions = nullptr;
 };

@@ -48,7 +48,9 @@ class GroupParameterReplacerWithoutStorageTest : public ::testing::Test {
   GroupParameterReplacer staging;
 };
 
-std::vector<std::string> Keys(const std::map<std::string, Staged>& entries) {
+// The full names of a set's entries, in map order.
+template <typename Value>
+std::vector<std::string> Keys(const std::map<std::string, Value>& entries) {
   std::vector<std::string> keys;
   for (const auto& entry : entries) {
     keys.push_back(entry.first);
@@ -233,11 +235,7 @@ TEST_F(GroupParameterReplacerTest, ApplyWritesTheEntriesOfTheNodeInFullNameOrder
                                     {"SetIntValue", "P1", "local_port", "6001"},
                                     {"SetStringValue", "P1", "tx_suffix", "0D0A"}}));
   const auto applied = live.entries();
-  std::vector<std::string> keys;
-  for (const auto& entry : applied) {
-    keys.push_back(entry.first);
-  }
-  EXPECT_EQ(keys,
+  EXPECT_EQ(Keys(applied),
             (std::vector<std::string>{"Zone", "gap", "hex_tokens", "local_port", "tx_suffix"}));
   EXPECT_EQ(applied.at("gap").intValue, 40);
   EXPECT_TRUE(applied.at("hex_tokens").boolValue);

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cstring>
 #include <string>
 
@@ -65,8 +66,9 @@ TEST(IPParser, FailureLeavesOctetsUnchanged) {
   IPParser parser;
   ASSERT_TRUE(parser.Parse("9.8.7.6"));
   EXPECT_FALSE(parser.Parse("1.2.3.x"));
-  EXPECT_EQ(parser.octets[0], 9);
-  EXPECT_EQ(parser.octets[3], 6);
+  EXPECT_EQ(parser.octets, (std::array<unsigned char, 4>{9, 8, 7, 6}));
+  EXPECT_FALSE(parser.Parse("1.2.3"));
+  EXPECT_EQ(parser.octets, (std::array<unsigned char, 4>{9, 8, 7, 6}));
 }
 
 TEST(ParseIpAddress, FirstOctetMostSignificant) {

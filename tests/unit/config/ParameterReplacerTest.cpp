@@ -42,9 +42,10 @@ static_assert(!CanGet<bool, int>::value, "a flag default must not read an intege
 static_assert(!CanGet<Literal, int>::value, "a literal default must not read an integer");
 static_assert(!CanGet<int, std::string>::value, "an integer default must not read a text");
 
-// Binds a second-generation storage double as the module's permanent storage
-// and clears the module-wide pointer again afterwards.
-class ParameterReplacerTest : public ::testing::Test {
+// Binds a storage double of the given generation as the module's permanent
+// storage and clears the module-wide pointer again afterwards.
+template <MemoryStorage::Generation kGeneration>
+class StorageBoundTest : public ::testing::Test {
  protected:
   void SetUp() override {
     piPermanentStorage = &storage;
@@ -52,22 +53,13 @@ class ParameterReplacerTest : public ::testing::Test {
   }
   void TearDown() override { piPermanentStorage = nullptr; }
 
-  MemoryStorage storage;
+  MemoryStorage storage{kGeneration};
   ParameterReplacer live;
 };
 
-// The same with a storage that offers only the first interface.
-class ParameterReplacerFirstGenerationTest : public ::testing::Test {
- protected:
-  void SetUp() override {
-    piPermanentStorage = &storage;
-    live.setSection(kSection);
-  }
-  void TearDown() override { piPermanentStorage = nullptr; }
-
-  MemoryStorage storage{MemoryStorage::Generation::First};
-  ParameterReplacer live;
-};
+using ParameterReplacerTest = StorageBoundTest<MemoryStorage::Generation::Second>;
+// A storage that offers only the first interface.
+using ParameterReplacerFirstGenerationTest = StorageBoundTest<MemoryStorage::Generation::First>;
 
 // No storage service bound.
 class ParameterReplacerWithoutStorageTest : public ::testing::Test {
@@ -179,9 +171,12 @@ TEST_F(ParameterReplacerTest, A256CharacterTextFailsAndGivesTheEmptyTextNotTheDe
 TEST_F(ParameterReplacerTest, AFailedTextReadGivesTheEmptyText) {
   storage.presetText(kSection, "socket_type", "TCP");
   storage.failStringReads(true);
-  std::string out;
+  std::string out = "untouched";
   live.get("socket_type", -1, "UDP", out);
   EXPECT_EQ(out, "");
+  EXPECT_EQ(storage.calls(), (Calls{{"HasValue", "P1", "socket_type", "1"},
+                                    {"ConvertTo", "", "IPermanentStorage2", ""},
+                                    {"GetStringValueInto", "P1", "socket_type", "256"}}));
 }
 
 TEST_F(ParameterReplacerTest, AnAbsentNameGivesTheDefaultWithoutAGetterCall) {

@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "TestTag.h"
+#include "TestTagBase.h"
 
 using ProtUtilsN::CopyBits;
 using ProtUtilsN::GetLenOfBits;
@@ -133,12 +133,12 @@ TEST(BitFunctions, NoBitsOrNegativePositionsTouchNothing) {
 }
 
 TEST(StartingBit, ByteOffsetTimesEightPlusBitIndexForBitTypes) {
-  TestTag bit(ICU_BOOLEAN, 1);
+  TestTagBase bit(ICU_BOOLEAN, 1);
   bit.setByteOffset(3);
   bit.setBitIndex(5);
   EXPECT_EQ(ProtUtilsN::getStartingBit(&bit), 29);
   EXPECT_EQ(ProtUtilsN::getEndingBit(&bit), 30);
-  TestTag bits(ICU_BOOLEAN_ARRAY, 10, ICU_BOOLEAN);
+  TestTagBase bits(ICU_BOOLEAN_ARRAY, 10, ICU_BOOLEAN);
   bits.setByteOffset(1);
   bits.setBitIndex(2);
   EXPECT_EQ(ProtUtilsN::getStartingBit(&bits), 10);
@@ -146,7 +146,7 @@ TEST(StartingBit, ByteOffsetTimesEightPlusBitIndexForBitTypes) {
 }
 
 TEST(StartingBit, NonBitTypeIgnoresBitIndexAndUsesPackedLength) {
-  TestTag word(ICU_UNSIGNED_SHORT, 2);
+  TestTagBase word(ICU_UNSIGNED_SHORT, 2);
   word.setByteOffset(4);
   word.setBitIndex(3);
   EXPECT_EQ(ProtUtilsN::getStartingBit(&word), 32);

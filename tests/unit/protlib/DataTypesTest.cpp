@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "TestTag.h"
+#include "TestTagBase.h"
 
 using ProtUtilsN::DataTypes;
 using ProtUtilsN::GetDataLength;
@@ -108,6 +108,8 @@ TEST(GetTAVUType, CountedTypesMultiplyItemLength) {
   EXPECT_EQ(p.length, 30);
   p = Parse("int64-2");
   EXPECT_TRUE(p.ok);
+  EXPECT_EQ(p.type, ICU_INT64_ARRAY);
+  EXPECT_EQ(p.itemType, ICU_INT64);
   EXPECT_EQ(p.length, 16);
 }
 
@@ -120,9 +122,12 @@ TEST(GetTAVUType, FixedTypesTakeRowLength) {
   p = Parse("object");
   EXPECT_TRUE(p.ok);
   EXPECT_EQ(p.type, ICU_OBJECT);
+  EXPECT_EQ(p.itemType, ICU_NONE);
   EXPECT_EQ(p.length, 0);
   p = Parse("time");
   EXPECT_TRUE(p.ok);
+  EXPECT_EQ(p.type, ICU_TIME);
+  EXPECT_EQ(p.itemType, ICU_NONE);
   EXPECT_EQ(p.length, 10);
 }
 
@@ -258,16 +263,16 @@ TEST(GetTAVUName, RoundTripsEveryCountedAndFixedType) {
 }
 
 TEST(GetItemCount, ScalarTagCountsOne) {
-  const TestTag tag(ICU_INT, 4);
+  const TestTagBase tag(ICU_INT, 4);
   EXPECT_EQ(ProtUtilsN::GetItemCount(&tag), 1);
-  const TestTag object(ICU_OBJECT, 12);
+  const TestTagBase object(ICU_OBJECT, 12);
   EXPECT_EQ(ProtUtilsN::GetItemCount(&object), 1);
 }
 
 TEST(GetItemCount, ArrayTagDividesByItemLength) {
-  const TestTag tag(ICU_SHORT_ARRAY, 10, ICU_SHORT);
+  const TestTagBase tag(ICU_SHORT_ARRAY, 10, ICU_SHORT);
   EXPECT_EQ(ProtUtilsN::GetItemCount(&tag), 5);
-  const TestTag strings(ICU_STRING, 20, ICU_BYTE);
+  const TestTagBase strings(ICU_STRING, 20, ICU_BYTE);
   EXPECT_EQ(ProtUtilsN::GetItemCount(&strings), 20);
 }
 
@@ -280,10 +285,10 @@ TEST(GetItemCount, FromLengthAndItemType) {
 }
 
 TEST(GetBasicType, ItemTypeWinsOverTagType) {
-  const TestTag array(ICU_DOUBLE_ARRAY, 16, ICU_DOUBLE);
+  const TestTagBase array(ICU_DOUBLE_ARRAY, 16, ICU_DOUBLE);
   EXPECT_EQ(ProtUtilsN::GetBasicType(&array), ICU_DOUBLE);
   EXPECT_EQ(ProtUtilsN::GetBasicLength(&array), 8);
-  const TestTag scalar(ICU_UNSIGNED_SHORT, 2);
+  const TestTagBase scalar(ICU_UNSIGNED_SHORT, 2);
   EXPECT_EQ(ProtUtilsN::GetBasicType(&scalar), ICU_UNSIGNED_SHORT);
   EXPECT_EQ(ProtUtilsN::GetBasicLength(&scalar), 2);
   EXPECT_EQ(ProtUtilsN::GetBasicType(nullptr), ICU_NONE);
@@ -295,9 +300,9 @@ TEST(IsBitType, OnlyBooleanAndBooleanArray) {
     SCOPED_TRACE(type);
     EXPECT_EQ(ProtUtilsN::IsBitType(static_cast<ICU_Type>(type)), type == 1 || type == 13);
   }
-  const TestTag bits(ICU_BOOLEAN_ARRAY, 3, ICU_BOOLEAN);
+  const TestTagBase bits(ICU_BOOLEAN_ARRAY, 3, ICU_BOOLEAN);
   EXPECT_TRUE(ProtUtilsN::IsBitType(&bits));
-  const TestTag bytes(ICU_BYTE_ARRAY, 3, ICU_BYTE);
+  const TestTagBase bytes(ICU_BYTE_ARRAY, 3, ICU_BYTE);
   EXPECT_FALSE(ProtUtilsN::IsBitType(&bytes));
   EXPECT_FALSE(ProtUtilsN::IsBitType(static_cast<const ITag*>(nullptr)));
 }

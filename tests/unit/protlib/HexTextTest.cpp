@@ -4,6 +4,19 @@
 
 #include <string>
 
+TEST(HexDigitValue, DigitsInEitherCaseAndMinusOneForAnythingElse) {
+  const std::string digits = "0123456789abcdef";
+  for (int value = 0; value < 16; ++value) {
+    const char lower = digits[static_cast<std::size_t>(value)];
+    EXPECT_EQ(hexDigitValue(lower), value) << lower;
+    const char upper = static_cast<char>(lower >= 'a' ? lower - 'a' + 'A' : lower);
+    EXPECT_EQ(hexDigitValue(upper), value) << upper;
+  }
+  for (const char other : {'g', 'G', '/', ':', '@', '`', ' ', '-', '\0', '\xff'}) {
+    EXPECT_EQ(hexDigitValue(other), -1) << static_cast<int>(other);
+  }
+}
+
 TEST(FromHex, NoneAndEmptyGiveNoBytes) {
   EXPECT_EQ(fromHex("none"), "");
   EXPECT_EQ(fromHex(""), "");

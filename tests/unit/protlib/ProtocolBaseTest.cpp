@@ -653,6 +653,7 @@ TEST(ProtocolBaseDatagrams, TimestampedDatagramWritesOneStampPerTag) {
   EXPECT_EQ(ts[2], ts[0]);
   EXPECT_EQ(ts[3], 42U);
   EXPECT_EQ(status[0], 1);
+  EXPECT_EQ(status[1], 1);
   EXPECT_EQ(status[2], 1);
 }
 
@@ -753,7 +754,11 @@ TEST(ProtocolBaseArrays, NullArgumentsFail) {
   EXPECT_STREQ(protocol.GetLastErrorString(), "no tag given");
   EXPECT_FALSE(protocol.readArrayItem(tag, 0, nullptr));
   EXPECT_STREQ(protocol.GetLastErrorString(), "no buffer given");
+  protocol.SetError(1, "");
   EXPECT_FALSE(protocol.writeArrayItem(tag, 0, nullptr));
+  EXPECT_EQ(protocol.GetLastError(), -1);
+  EXPECT_STREQ(protocol.GetLastErrorString(), "no buffer given");
+  EXPECT_EQ(protocol.blockReads(), 0);
   EXPECT_EQ(protocol.writes(), 0);
 }
 
@@ -887,9 +892,12 @@ TEST(OverrideDetection, ReadWithBitBlockOperationsUsesTheBitBlockRead) {
 TEST(OverrideDetection, ReadWhereBitBlocksAreDeclinedUsesTheBlockRead) {
   MemoryProtocolWithOverrides protocol;
   protocol.bitBlocks = false;
+  Put(protocol, 0, {1, 2, 3, 4});
   ITag* tag = MustCreate(protocol, "0?int");
-  unsigned char value[4];
+  unsigned char value[4] = {};
   ASSERT_TRUE(protocol.Read(tag, value));
+  EXPECT_EQ(Bytes(value, value + 4), (Bytes{1, 2, 3, 4}));
+  EXPECT_EQ(protocol.lastBlockReadLength(), 4);
   EXPECT_EQ(protocol.bitBlockReads, 0);
   EXPECT_EQ(protocol.blockReads(), 1);
 }
@@ -928,11 +936,13 @@ TEST(OverrideDetection, ReadWithTimestampUsesTheDriversRead) {
   TestTagBase tag(ICU_BINARY, 3, ICU_UNSIGNED_BYTE);
   unsigned char value[3] = {};
   unsigned long long ts = 0;
+  const unsigned long long before = ProtUtilsN::currentTimeStamp();
   ASSERT_TRUE(protocol.readWithTimestamp(&tag, value, &ts));
   EXPECT_EQ(Bytes(value, value + 3), (Bytes{0xA0, 0xA1, 0xA2}));
   EXPECT_EQ(protocol.reads, 1);
   EXPECT_EQ(protocol.blockReads(), 0);
-  EXPECT_NE(ts, 0U);
+  EXPECT_GE(ts, before);
+  EXPECT_LE(ts, ProtUtilsN::currentTimeStamp());
 }
 
 TEST(OverrideDetection, ArrayItemsUseTheDriversRead) {
@@ -977,10 +987,12 @@ TEST(OverrideDetection, TimestampedDatagramWithOnlyDatagramReadWritesStatusOne) 
   unsigned char buffer[4] = {};
   idal_error_t status[1] = {-4};
   unsigned long long ts[1] = {0};
+  const unsigned long long before = ProtUtilsN::currentTimeStamp();
   ASSERT_TRUE(protocol.readDatagramWithTimestamp(tags, 1, buffer, status, ts));
   EXPECT_EQ(Bytes(buffer, buffer + 4), (Bytes{4, 3, 2, 1}));
   EXPECT_EQ(status[0], 1);
-  EXPECT_NE(ts[0], 0U);
+  EXPECT_GE(ts[0], before);
+  EXPECT_LE(ts[0], ProtUtilsN::currentTimeStamp());
   EXPECT_EQ(protocol.datagramReads, 1);
 }
 
@@ -991,12 +1003,14 @@ TEST(OverrideDetection, TimestampedDatagramUsesTheDriversStatusRead) {
   unsigned char buffer[8] = {};
   idal_error_t status[2] = {};
   unsigned long long ts[2] = {0, 0};
+  const unsigned long long before = ProtUtilsN::currentTimeStamp();
   ASSERT_TRUE(protocol.readDatagramWithTimestamp(tags, 2, buffer, status, ts));
   EXPECT_EQ(buffer[0], 0x5A);
   EXPECT_EQ(status[0], 7);
   EXPECT_EQ(status[1], 7);
   EXPECT_EQ(protocol.statusReads, 1);
   EXPECT_EQ(protocol.datagramReads, 0);
-  EXPECT_NE(ts[0], 0U);
+  EXPECT_GE(ts[0], before);
+  EXPECT_LE(ts[0], ProtUtilsN::currentTimeStamp());
   EXPECT_EQ(ts[1], ts[0]);
 }

@@ -70,5 +70,5 @@ TEST(ProtocolBaseThreads, ErrorsAndTagListAreSafeAcrossThreads) {
     thread.join();
   }
   EXPECT_EQ(unexpected.load(), 0);
-  EXPECT_TRUE(allowed.count(protocol.GetLastErrorString()) == 1);
+  EXPECT_EQ(allowed.count(protocol.GetLastErrorString()), 1U);
 }

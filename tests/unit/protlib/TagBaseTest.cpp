@@ -214,7 +214,7 @@ TEST(TagBaseConvert, NamesAreCaseSensitive) {
   TestTagBase tag(ICU_SHORT, 2);
   tag.setConversions({"Swap2"});
   bool ok = true;
-  ToDevice(tag, {1, 2}, 0, &ok);
+  EXPECT_EQ(ToDevice(tag, {1, 2}, 0, &ok), (Bytes{0, 0}));
   EXPECT_FALSE(ok);
   EXPECT_EQ(tag.GetError(), "Conversion error at: Swap2");
 }
@@ -223,7 +223,7 @@ TEST(TagBaseConvert, FirstFailureStopsTheChain) {
   TestTagBase tag(ICU_STRING, 3, ICU_BYTE);
   tag.setConversions({"swap4", "swap2"});
   bool ok = true;
-  ToDevice(tag, {1, 2, 3}, 0, &ok);
+  EXPECT_EQ(ToDevice(tag, {1, 2, 3}, 0, &ok), (Bytes{0, 0, 0}));
   EXPECT_FALSE(ok);
   EXPECT_EQ(tag.GetError(), "Conversion error at: swap4");
 }
@@ -241,7 +241,9 @@ TEST(TagBaseConvert, NullBuffersFail) {
   unsigned char bytes[4] = {};
   EXPECT_FALSE(tag.Convert(nullptr, bytes, true));
   EXPECT_EQ(tag.GetError(), "Conversion error: no buffer");
+  tag.SetError(nullptr);
   EXPECT_FALSE(tag.Convert(bytes, nullptr, false));
+  EXPECT_EQ(tag.GetError(), "Conversion error: no buffer");
 }
 
 TEST(TagBaseConvert, NegativeLengthFails) {
@@ -492,7 +494,7 @@ TEST(DoConversionInv, IntFails) {
   EXPECT_EQ(value, (Bytes{1, 2, 3, 4}));
   tag.setConversions({"inv"});
   bool ok = true;
-  ToDevice(tag, value, 0, &ok);
+  EXPECT_EQ(ToDevice(tag, value, 0, &ok), (Bytes{0, 0, 0, 0}));
   EXPECT_FALSE(ok);
   EXPECT_EQ(tag.GetError(), "Conversion error at: inv");
 }
@@ -527,6 +529,7 @@ TEST(DoConversionInv, OtherTypesFail) {
   const TestTagBase text(ICU_STRING, 4, ICU_BYTE);
   Bytes value(4, 0x0F);
   EXPECT_FALSE(text.DoConversion(value.data(), "inv", true));
+  EXPECT_EQ(value, Bytes(4, 0x0F));
 }
 
 TEST(DoConversionNeg, ScalarIntFiveBecomesMinusFive) {
@@ -606,9 +609,12 @@ TEST(DoConversionNeg, ItemReachingPastTheValueFails) {
   EXPECT_EQ(value, (Bytes{5, 0, 0x11, 0x22}));
 }
 
-TEST(TestTagBaseDouble, CloneCopiesConversionsAndErrorText) {
-  TestTagBase tag(ICU_SHORT, 2);
-  tag.setVarName("0?short(swap2)");
+TEST(TestTagBaseDouble, CloneCopiesEveryPropertyConversionsAndErrorText) {
+  TestTagBase tag(ICU_SHORT_ARRAY, 6, ICU_SHORT);
+  tag.setVarName("7?short-3(swap2)?2");
+  tag.setByteOffset(7);
+  tag.setBitIndex(2);
+  tag.setPackedLen(9);
   tag.setConversions({"swap2"});
   tag.SetError("old");
   const std::unique_ptr<ITag> copy(tag.Clone());
@@ -616,5 +622,21 @@ TEST(TestTagBaseDouble, CloneCopiesConversionsAndErrorText) {
   ASSERT_NE(base, nullptr);
   EXPECT_EQ(base->GetConversions(), std::vector<std::string>{"swap2"});
   EXPECT_EQ(base->GetError(), "old");
-  EXPECT_STREQ(base->GetVarName(), "0?short(swap2)");
+  EXPECT_STREQ(base->GetVarName(), "7?short-3(swap2)?2");
+  EXPECT_EQ(base->GetVarType(), ICU_SHORT_ARRAY);
+  EXPECT_EQ(base->GetItemType(), ICU_SHORT);
+  EXPECT_EQ(base->GetVarLength(), 6);
+  EXPECT_EQ(base->GetByteOffset(), 7);
+  EXPECT_EQ(base->GetBitIndex(), 2);
+  EXPECT_EQ(base->PackedLen(), 9);
+}
+
+TEST(TestTagBaseDouble, PackedLengthIsTheTagBasesUntilFixed) {
+  TestTagBase tag(ICU_BOOLEAN_ARRAY, 3, ICU_BOOLEAN);
+  tag.setBitIndex(6);
+  EXPECT_EQ(tag.PackedLen(), 2);
+  tag.setType(ICU_BYTE_ARRAY, 3, ICU_BYTE);
+  EXPECT_EQ(tag.PackedLen(), 3);
+  tag.setPackedLen(9);
+  EXPECT_EQ(tag.PackedLen(), 9);
 }
