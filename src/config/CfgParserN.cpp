@@ -61,9 +61,7 @@ std::string getErrorString(CfgParser::parseResult result, const char* name) {
       reason = "can't be node independent";
       break;
     case CfgParser::ParseInvalidSpec:
-      // The fixed text of this result (its bytes are part of the parser's
-      // interface); \x63 is the letter c.
-      reason = "has invalid internal spe\x63ification";
+      reason = "has invalid internal specification";
       break;
     default:
       break;

@@ -65,7 +65,7 @@ TEST(GetErrorString, TextForEveryResult) {
   EXPECT_EQ(getErrorString(CfgParser::ParseCantBeNodeIndependent, "m"),
             "Parser: parameter 'm' can't be node independent");
   EXPECT_EQ(getErrorString(CfgParser::ParseInvalidSpec, "x"),
-            "Parser: parameter 'x' has invalid internal spe\x63ification");
+            "Parser: parameter 'x' has invalid internal specification");
   EXPECT_EQ(getErrorString(CfgParser::ParseOk, "x"), "Parser: parameter 'x' has unknown error");
   EXPECT_EQ(getErrorString(CfgParser::ParseNodeOnly, "x"),
             "Parser: parameter 'x' has unknown error");
@@ -141,5 +141,5 @@ TEST(ReadParam, PrefixAndBothFlagErrorsFailEvenWhenOptional) {
   EXPECT_FALSE(readParam(parser, "m", -1, value, CfgParser::ParamNodeOnly, true, error));
   EXPECT_EQ(error, "Parser: parameter 'm' can't be node independent");
   EXPECT_FALSE(readParam(parser, "m", -1, value, 3, true, error));
-  EXPECT_EQ(error, "Parser: parameter 'm' has invalid internal spe\x63ification");
+  EXPECT_EQ(error, "Parser: parameter 'm' has invalid internal specification");
 }
