@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <array>
 
-#include "factory/HostServices.h"
+#include "binding/HostServices.h"
 
 namespace {
 

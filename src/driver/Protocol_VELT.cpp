@@ -7,6 +7,8 @@
 #include <functional>
 #include <vector>
 
+#include "binding/CompareInterface.h"
+#include "binding/HostServices.h"
 #include "config/IPParser.h"
 #include "driver/DatagramFraming.h"
 #include "driver/DriverConsole.h"
@@ -14,8 +16,6 @@
 #include "driver/StreamFraming.h"
 #include "driver/Tag_VELT.h"
 #include "driver/XmlDescription.h"
-#include "factory/CompareInterface.h"
-#include "factory/HostServices.h"
 #include "protlib/HexText.h"
 #include "protlib/ProtUtilsN.h"
 #include "protlib/ScratchBuffer.h"

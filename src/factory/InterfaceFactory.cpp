@@ -1,6 +1,6 @@
 #include "factory/InterfaceFactory.h"
 
-#include "factory/CompareInterface.h"
+#include "binding/CompareInterface.h"
 #include "factory/ModuleFactory.h"
 
 IInterface* InterfaceFactory::CreateInterface(const char* name) {

@@ -1,7 +1,7 @@
 #include "factory/ProtModule.h"
 
-#include "factory/CompareInterface.h"
-#include "factory/HostServices.h"
+#include "binding/CompareInterface.h"
+#include "binding/HostServices.h"
 
 namespace {
 

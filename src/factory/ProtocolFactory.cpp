@@ -1,7 +1,7 @@
 #include "factory/ProtocolFactory.h"
 
+#include "binding/CompareInterface.h"
 #include "driver/CreateProtocol_VELT.h"
-#include "factory/CompareInterface.h"
 
 IInterface* ProtocolFactory::ConvertTo(const char* name) {
   if (CompareInterface(name, "ProtocolFactory") != 0 ||

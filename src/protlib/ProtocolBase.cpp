@@ -5,8 +5,8 @@
 #include <cstring>
 #include <utility>
 
-#include "factory/CompareInterface.h"
-#include "factory/HostServices.h"
+#include "binding/CompareInterface.h"
+#include "binding/HostServices.h"
 #include "protlib/BaseConsole.h"
 #include "protlib/BitUtils.h"
 #include "protlib/BoundedText.h"

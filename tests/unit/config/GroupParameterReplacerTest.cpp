@@ -10,8 +10,8 @@
 
 #include "MemoryStorage.h"
 #include "StorageCall.h"
+#include "binding/HostServices.h"
 #include "config/ParameterReplacer.h"
-#include "factory/HostServices.h"
 
 namespace {
 

@@ -10,7 +10,7 @@
 
 #include "MemoryStorage.h"
 #include "StorageCall.h"
-#include "factory/HostServices.h"
+#include "binding/HostServices.h"
 
 namespace {
 

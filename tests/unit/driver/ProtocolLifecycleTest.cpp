@@ -4,9 +4,9 @@
 
 #include "DriverFixture.h"
 #include "IProtocolFactory.h"
+#include "binding/HostServices.h"
 #include "driver/XmlDescription.h"
 #include "factory/GetInterfaceFactory.h"
-#include "factory/HostServices.h"
 
 namespace {
 

@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "RecordingHostFactory.h"
-#include "factory/HostServices.h"
+#include "binding/HostServices.h"
 #include "factory/ModuleFactory.h"
 
 namespace {

@@ -11,7 +11,7 @@
 #include "InertServices.h"
 #include "MemoryProtocol.h"
 #include "TestTagBase.h"
-#include "factory/HostServices.h"
+#include "binding/HostServices.h"
 #include "protlib/ProtocolBase.h"
 
 namespace {

@@ -1,4 +1,4 @@
-#include "factory/CompareInterface.h"
+#include "binding/CompareInterface.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "factory/CompareInterface.h"
+#include "binding/CompareInterface.h"
 
 int CompareInterface(const char* a, const char* b) {
   if (a == nullptr || b == nullptr) {

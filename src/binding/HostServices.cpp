@@ -1,4 +1,4 @@
-#include "factory/HostServices.h"
+#include "binding/HostServices.h"
 
 // NOLINTBEGIN(cppcoreguidelines-avoid-non-const-global-variables): the
 // module-wide service pointers are the library's one prescribed global state.
