@@ -1,7 +1,7 @@
 #include "factory/InterfaceFactory.h"
 
 #include "binding/CompareInterface.h"
-#include "factory/ModuleFactory.h"
+#include "factory/ProtFactory.h"
 
 IInterface* InterfaceFactory::CreateInterface(const char* name) {
   if (CompareInterface(name, "IProtocolFactory") != 0 ||

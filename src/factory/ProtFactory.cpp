@@ -1,6 +1,4 @@
-// The plug-in's entry point and its module-wide Factory object.
-#include "factory/GetInterfaceFactory.h"
-#include "factory/ModuleFactory.h"
+#include "factory/ProtFactory.h"
 
 // The module object is, with the module-wide service pointers, the
 // library's one prescribed global state.

@@ -6,7 +6,7 @@
 #include "IProtocolFactory.h"
 #include "binding/HostServices.h"
 #include "driver/XmlDescription.h"
-#include "factory/GetInterfaceFactory.h"
+#include "factory/ProtFactory.h"
 
 namespace {
 

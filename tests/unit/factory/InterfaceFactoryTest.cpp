@@ -1,7 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "factory/GetInterfaceFactory.h"
-#include "factory/ModuleFactory.h"
+#include "factory/ProtFactory.h"
 
 TEST(GetInterfaceFactory, AlwaysReturnsTheSameObject) {
   IInterfaceFactory* const first = GetInterfaceFactory();

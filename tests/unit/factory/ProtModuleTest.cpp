@@ -7,7 +7,7 @@
 
 #include "RecordingHostFactory.h"
 #include "binding/HostServices.h"
-#include "factory/ModuleFactory.h"
+#include "factory/ProtFactory.h"
 
 namespace {
 

@@ -1,8 +1,11 @@
 #pragma once
 
+#include "IInterfaceFactory.h"
 #include "factory/InterfaceFactory.h"
 #include "factory/ProtModule.h"
 #include "factory/ProtocolFactory.h"
+
+// The plug-in's entry point and the one module-wide object behind it.
 
 // The library's one module-wide object, in this order: the interface factory
 // that GetInterfaceFactory hands out, the protocol factory and the module.
@@ -19,3 +22,8 @@ struct ModuleFactory {
 // library's one prescribed global state.
 // NOLINTNEXTLINE(cppcoreguidelines-avoid-non-const-global-variables)
 extern ModuleFactory Factory;
+
+// The plug-in's one exported symbol: the library's interface factory, from
+// which the host reaches the protocol factory and the module by name. It
+// never fails and always returns the same object.
+extern "C" IInterfaceFactory* GetInterfaceFactory();
