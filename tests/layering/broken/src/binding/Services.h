@@ -1,0 +1,4 @@
+#pragma once
+
+// Breaks: the bottom layer reaches up into the configuration.
+#include "config/Store.h"

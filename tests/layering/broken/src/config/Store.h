@@ -1,0 +1,9 @@
+#pragma once
+
+// Allowed: the middle layers include each other, the bottom and the
+// standard library.
+#include <string>
+
+#include "IThing.h"
+#include "binding/Services.h"
+#include "protlib/Text.h"

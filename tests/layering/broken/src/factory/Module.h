@@ -1,0 +1,4 @@
+#pragma once
+
+// Allowed: the top layer includes the driver.
+#include "driver/Channel.h"

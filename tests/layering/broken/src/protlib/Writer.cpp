@@ -1,0 +1,2 @@
+// Breaks: a name that resolves to no file.
+#include "Missing.h"

@@ -1,0 +1,4 @@
+#pragma once
+
+// Breaks: a folder that belongs to no layer.
+#include <vector>
