@@ -35,9 +35,11 @@ enum ICU_Type : std::int32_t {
   ICU_OBJECT = 27
 };
 
-// Per-tag status written by datagram reads; 1 means "read successfully".
+// Per-tag status written by datagram reads; 1 means "read successfully". A
+// failed datagram read writes none.
 using idal_error_t = std::int32_t;
 
-// Host objects that the protocol interface passes by pointer only.
+// Host objects that the protocol interface passes by pointer only; this
+// plug-in never looks inside them.
 class IObjectString;
 class IEventProcessor;

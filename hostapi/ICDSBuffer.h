@@ -2,10 +2,12 @@
 
 #include "IInterface.h"
 
-// The host's shared data-buffer service ("ICDSBuffer"). This driver binds and releases it
-// and reads nothing but its identity.
+// The host's shared data-buffer service ("ICDSBuffer", mandatory). The plug-in
+// binds it in IProtModule::Init and gives it back in Close, and calls nothing
+// else.
 class ICDSBuffer : public IInterface {
  public:
+  // The implementation's name and version.
   virtual const char* GetImpName() const = 0;
   virtual int GetImpVersion() const = 0;
 

@@ -2,10 +2,12 @@
 
 #include "IInterface.h"
 
-// The host's driver interface service ("IDriverInterface"). This driver binds and releases it
-// and reads nothing but its identity.
+// The host's driver interface service ("IDriverInterface", optional). The
+// plug-in binds it in IProtModule::Init and gives it back in Close, and calls
+// nothing else.
 class IDriverInterface : public IInterface {
  public:
+  // The implementation's name and version.
   virtual const char* GetImpName() const = 0;
   virtual int GetImpVersion() const = 0;
 

@@ -2,10 +2,13 @@
 
 #include "IInterface.h"
 
-// The host's serial-port service ("ISerialFactory"). This driver binds and releases it
-// and reads nothing but its identity.
+// The host's serial-port service ("ISerialFactory", mandatory). The plug-in
+// binds it in IProtModule::Init and gives it back in Close; it reads nothing
+// but its identity, which a protocol's information text shows.
 class ISerialFactory : public IInterface {
  public:
+  // The implementation's name and version, shown in a protocol's
+  // information text (any thread).
   virtual const char* GetImpName() const = 0;
   virtual int GetImpVersion() const = 0;
 

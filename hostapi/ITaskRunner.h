@@ -1,10 +1,14 @@
 #pragma once
 
 // The body of a host task: the host's task calls Task() once on its own
-// thread. Slots: two destructor slots, Task.
+// thread, after IMultiTask2::StartTask. The plug-in's runner loops in Task(),
+// one pass at a time, and returns once the task's IsStopping() turns
+// non-zero. The runner belongs to its creator and outlives the task.
+// Slots: two destructor slots, Task.
 class ITaskRunner {
  public:
   virtual ~ITaskRunner() = default;
+  // Runs the task's work on the task's thread; returning ends the task.
   virtual void Task() = 0;
 
  protected:
