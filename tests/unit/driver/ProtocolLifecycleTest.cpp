@@ -247,6 +247,16 @@ TEST_F(ProtocolLifecycleTest, FailedAdapterLookupDeletesTheProbe) {
   EXPECT_EQ(sockets.Log(), (Log{"create 0 0 0 -> #1", "delete #1 0"}));
 }
 
+TEST_F(ProtocolLifecycleTest, ChannelSocketThatCannotBeMadeLeavesNoErrorAndStartSucceeds) {
+  sockets.FailCreates(1);
+  Protocol_VELT& p = Create(kUdpConfig);
+  EXPECT_TRUE(p.Start());
+  EXPECT_EQ(p.GetLastError(), 1);
+  EXPECT_STREQ(p.GetLastErrorString(), "");
+  EXPECT_EQ(sockets.Log(), Log{"create 6000 0 0 -> null"});
+  EXPECT_EQ(tasks.TasksCreated(), 1);
+}
+
 TEST_F(ProtocolLifecycleTest, StartReadsTheThirteenLiveNamesInOrder) {
   storage.presetInt("VELT", "remote_port", 7777);
   Started(kUdpConfig);
