@@ -52,7 +52,8 @@ class IMultiTask2 : public IInterface {
   // Sleeps the calling thread for milliseconds; 0 yields. The worker sleeps
   // 0 between passes and 10 when idle or retrying.
   virtual void Sleep(int milliseconds) = 0;
-  // A new unlocked mutex, owned by the host until DeleteMutex.
+  // A new unlocked mutex, owned by the host until DeleteMutex. It must not
+  // fail: a protocol given null has no lock around its token queue.
   virtual IMutex* CreateMutex() = 0;
   // Frees a mutex made by CreateMutex; no thread holds or waits for it.
   virtual void DeleteMutex(IMutex* mutex) = 0;

@@ -34,9 +34,10 @@ class IProtModule : public IInterface {
   // IPermanentStorage (those held), IMultiTask2, ISerialFactory,
   // ISocketFactory, ICDSBuffer. Does nothing on a module that is not bound.
   virtual void Close() = 0;
-  // Why the last Init failed ("IMultiTask2 not created", "ISerialFactory not
-  // created", "ISocketFactory not created", "piCDSBuffer not created"); empty
-  // if none failed. Valid until the next Init.
+  // Why the last Init failed, one of "IMultiTask2 not created",
+  // "ISerialFactory not created", "ISocketFactory not created" and
+  // "piCDSBuffer not created"; empty if none failed. Valid until the next
+  // Init.
   virtual const char* GetLastError() const = 0;
 
  protected:

@@ -12,9 +12,9 @@
 // Failures: a bool or pointer result reports success; a failing call records
 // its reason as the instance's last error (GetLastError, GetLastErrorString),
 // which stays until the next failure. Codes: 1 none yet; -1 configuration,
-// address, unsupported operation and most driver errors; -3 "Protocol not
-// started" and "Optimized writing not supported"; -6 socket set-up; -9 "read
-// conversion error" and "write conversion error".
+// address, unsupported operation and most driver errors; -3 for
+// "Protocol not started" and "Optimized writing not supported"; -6 socket
+// set-up; -9 for "read conversion error" and "write conversion error".
 //
 // Threads: Config, Start, Stop and SetIdent on the control thread; the tag
 // operations on any number of tag threads at once (one tag per thread at a
@@ -62,8 +62,8 @@ class IProtocol : public IInterface {
   // Reads length device bytes of the tag's memory type, from the tag's
   // position, into buffer without conversion. False with the last error.
   virtual bool ReadBlock(const ITag* tag, unsigned char* buffer, int length) = 0;
-  // Writes length device bytes; unsupported here: error -3 "Optimized writing
-  // not supported", false.
+  // Writes length device bytes. Not offered here: false, error -3 with
+  // "Optimized writing not supported".
   virtual bool WriteBlock(const ITag* tag, const unsigned char* buffer, int length) = 0;
   // Most tags one datagram read may hold; 0: no datagrams.
   virtual int MaxDatagramItems(const ITag* tag) = 0;
