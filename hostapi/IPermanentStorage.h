@@ -5,10 +5,10 @@
 // The host's permanent storage ("IPermanentStorage", optional): typed values
 // by section and name that survive a restart. The plug-in's section is a
 // protocol's identity (IProtocol::GetIdent), its names those of the runtime
-// parameters. It reads at Start on the control thread and writes when a tag
-// thread applies staged parameters, for several protocols at once: the
-// storage must be thread-safe. Null section, name or value texts are never
-// passed.
+// parameters. It reads at a protocol's first Start on the control thread and
+// writes when a tag thread applies staged parameters, for several protocols
+// at once: the storage must be thread-safe. Null section, name or value
+// texts are never passed.
 class IPermanentStorage : public IInterface {
  public:
   // This object for the interface names it answers ("IPermanentStorage",

@@ -274,6 +274,14 @@ TEST_F(ProtocolLifecycleTest, StartReadsTheThirteenLiveNamesInOrder) {
   EXPECT_EQ(protocol->getSettings().remoteIp, "127.0.0.1");
 }
 
+TEST_F(ProtocolLifecycleTest, StorageIsReadOnlyAtTheFirstStart) {
+  Protocol_VELT& p = Started(kUdpConfig);
+  p.Stop();
+  storage.clearCalls();
+  p.Start();
+  EXPECT_TRUE(storage.calls().empty());
+}
+
 TEST_F(ProtocolLifecycleTest, StoredValuesLiveUnderTheInstanceIdentity) {
   storage.presetText("panel-7", "remote_ip_address", "127.0.0.9");
   Protocol_VELT& p = Create(kUdpConfig);
