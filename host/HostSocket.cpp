@@ -159,7 +159,8 @@ int HostSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMillise
       timeoutMilliseconds < 0 ? Clock::time_point::max()
                               : Clock::now() + std::chrono::milliseconds(timeoutMilliseconds);
   const std::lock_guard<std::mutex> lock(receiveMutex_);
-  return tcp_ ? ReceiveTcp(buffer, maxLength, deadline) : ReceiveUdp(buffer, maxLength, deadline);
+  return tcp_ ? ReceiveTcp(buffer, maxLength, deadline)
+              : WaitAndTake(&HostSocket::TakeDatagram, buffer, maxLength, deadline);
 }
 
 int HostSocket::ServeBuffered(unsigned char* buffer, int maxLength) {
@@ -169,7 +170,12 @@ int HostSocket::ServeBuffered(unsigned char* buffer, int maxLength) {
   return static_cast<int>(count);
 }
 
-int HostSocket::ReceiveUdp(unsigned char* buffer, int maxLength, Clock::time_point deadline) {
+// Waits until the descriptor is readable, then takes what is there: 0 when
+// the time-out elapsed or the task was asked to stop, -1 when the wait
+// failed, otherwise take's answer. A readable descriptor that held nothing
+// after all is waited for again.
+int HostSocket::WaitAndTake(Take take, unsigned char* buffer, int maxLength,
+                            Clock::time_point deadline) {
   for (;;) {
     const WaitResult wait = WaitFor(fd_.Get(), POLLIN, deadline);
     if (wait == WaitResult::TimedOut || wait == WaitResult::Stopped) {
@@ -178,16 +184,21 @@ int HostSocket::ReceiveUdp(unsigned char* buffer, int maxLength, Clock::time_poi
     if (wait == WaitResult::Failed) {
       return -1;
     }
-    // One datagram per call; the kernel truncates it to the buffer and drops
-    // the rest.
-    const ssize_t n = ::recv(fd_.Get(), buffer, static_cast<std::size_t>(maxLength), MSG_DONTWAIT);
-    if (n >= 0) {
-      return static_cast<int>(n);
-    }
-    if (!WouldBlock(errno) && errno != EINTR) {
-      return -1;
+    const int taken = (this->*take)(buffer, maxLength);
+    if (taken != kNothingYet) {
+      return taken;
     }
   }
+}
+
+// One datagram per call; the kernel truncates it to the buffer and drops the
+// rest.
+int HostSocket::TakeDatagram(unsigned char* buffer, int maxLength) {
+  const ssize_t n = ::recv(fd_.Get(), buffer, static_cast<std::size_t>(maxLength), MSG_DONTWAIT);
+  if (n >= 0) {
+    return static_cast<int>(n);
+  }
+  return WouldBlock(errno) || errno == EINTR ? kNothingYet : -1;
 }
 
 int HostSocket::GetAdapterInfo(unsigned int ip, unsigned int* address, unsigned int* mask,

@@ -112,6 +112,11 @@ class HostSocket final : public ISocket {
   static constexpr std::size_t kReceiveBufferSize = 4096;
 
   enum class WaitResult { Ready, TimedOut, Stopped, Failed };
+  // What a take answers when the descriptor turned out to hold nothing.
+  static constexpr int kNothingYet = -2;
+  // Takes what a readable descriptor holds into the caller's buffer: bytes
+  // taken, -1 at the end or on an error, kNothingYet.
+  using Take = int (HostSocket::*)(unsigned char* buffer, int maxLength);
   enum class Handshake { Made, Refused, Stopped };
 
   // A TCP connection as the receiving side sees it. Guarded by
@@ -130,6 +135,7 @@ class HostSocket final : public ISocket {
   static bool Bind(int fd, unsigned short port, std::string& error);
   static bool ParseAddress(const char* ip, unsigned short port, sockaddr_in& address);
   static WaitResult WaitFor(int fd, short events, Clock::time_point deadline);
+  int WaitAndTake(Take take, unsigned char* buffer, int maxLength, Clock::time_point deadline);
   static bool WouldBlock(int error) { return error == EAGAIN || error == EWOULDBLOCK; }
 
   // TCP, in HostSocketTcp.cpp.
@@ -149,7 +155,7 @@ class HostSocket final : public ISocket {
   int ConnectUdp(const sockaddr_in& peer);
   void RecordLocalPort();
   int ServeBuffered(unsigned char* buffer, int maxLength);
-  int ReceiveUdp(unsigned char* buffer, int maxLength, Clock::time_point deadline);
+  int TakeDatagram(unsigned char* buffer, int maxLength);
   int SendUdp(const unsigned char* data, std::size_t length);
   bool WaitWritable(Clock::time_point deadline);
 

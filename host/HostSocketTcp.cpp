@@ -164,24 +164,12 @@ int HostSocket::ReceiveTcp(unsigned char* buffer, int maxLength, Clock::time_poi
   if (link_ != Link::kOpen) {
     return -1;
   }
-  for (;;) {
-    const WaitResult wait = WaitFor(fd_.Get(), POLLIN, deadline);
-    if (wait == WaitResult::TimedOut || wait == WaitResult::Stopped) {
-      return 0;
-    }
-    if (wait == WaitResult::Failed) {
-      return -1;
-    }
-    const int n = Fill(buffer, maxLength);
-    if (n != 0) {
-      return n;
-    }
-  }
+  return WaitAndTake(&HostSocket::Fill, buffer, maxLength, deadline);
 }
 
 // One recv: straight into a caller's buffer that is at least as large as
-// the internal one, else into the internal one. Bytes taken, 0 when nothing
-// was there after all, -1 at the end of the stream.
+// the internal one, else into the internal one. Bytes taken, kNothingYet
+// when nothing was there after all, -1 at the end of the stream.
 int HostSocket::Fill(unsigned char* buffer, int maxLength) {
   const bool direct = static_cast<std::size_t>(maxLength) >= rxBuffer_.size();
   unsigned char* const target = direct ? buffer : rxBuffer_.data();
@@ -196,7 +184,7 @@ int HostSocket::Fill(unsigned char* buffer, int maxLength) {
     return ServeBuffered(buffer, maxLength);
   }
   if (n < 0 && (WouldBlock(errno) || errno == EINTR)) {
-    return 0;
+    return kNothingYet;
   }
   // 0: the peer closed; otherwise reset or failed. Everything before the end
   // has been received.
