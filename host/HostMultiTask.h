@@ -17,7 +17,7 @@ class HostMultiTask final : public IMultiTask2 {
   // The stack of each task thread. A driver's worker needs a few KiB; the
   // system's default (8 MiB) would cost a 32-bit panel 2 GiB of address
   // space for 256 channels.
-  static constexpr std::size_t kDefaultTaskStackBytes = 256 * 1024;
+  static constexpr std::size_t kDefaultTaskStackBytes = std::size_t{256} * 1024;
 
   explicit HostMultiTask(std::size_t taskStackBytes = kDefaultTaskStackBytes)
       : taskStackBytes_(taskStackBytes) {}
