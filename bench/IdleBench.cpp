@@ -150,9 +150,11 @@ struct Usage {
   double cpuPercent = 0;
   double residentKiB = 0;
   double peakKiB = 0;
-  // Wakes of the process's threads per second, and CPU per wake.
-  double wakesPerSecond = 0;
-  double microsecondsPerWake = 0;
+  // Context switches of the process's threads per second (a wake from a
+  // sleep or a wait is one, a yield to another thread one more), and CPU
+  // per switch.
+  double switchesPerSecond = 0;
+  double microsecondsPerSwitch = 0;
 };
 
 Usage Measure(const Build& build, const Channels& channels, const IdlePeers::SilentAcceptor* tcp,
@@ -174,12 +176,12 @@ Usage Measure(const Build& build, const Channels& channels, const IdlePeers::Sil
   SleepSeconds(seconds);
   const auto cpu1 = child.CpuTime();
   const double wall = Seconds(Clock::now() - wall0);
-  const auto wakes = static_cast<double>(child.ContextSwitches() - switches0);
+  const auto switches = static_cast<double>(child.ContextSwitches() - switches0);
   Usage usage;
   const double cpu = std::chrono::duration<double>(cpu1 - cpu0).count();
   usage.cpuPercent = cpu / wall * 100.0;
-  usage.wakesPerSecond = wakes / wall;
-  usage.microsecondsPerWake = wakes > 0 ? cpu * 1e6 / wakes : 0;
+  usage.switchesPerSecond = switches / wall;
+  usage.microsecondsPerSwitch = switches > 0 ? cpu * 1e6 / switches : 0;
   usage.residentKiB = static_cast<double>(child.ResidentKiB());
   usage.peakKiB = static_cast<double>(child.PeakResidentKiB());
   child.Finish(milliseconds(20000));
@@ -345,8 +347,8 @@ void RunOne(const Options& options, Report& report, const std::string& scenario,
       report.Add(scenario, "CPU % of a core", build.label, usage.cpuPercent);
       report.Add(scenario, "resident KiB", build.label, usage.residentKiB);
       report.Add(scenario, "peak resident KiB", build.label, usage.peakKiB);
-      report.Add(scenario, "wakes per second", build.label, usage.wakesPerSecond);
-      report.Add(scenario, "CPU us per wake", build.label, usage.microsecondsPerWake);
+      report.Add(scenario, "switches per second", build.label, usage.switchesPerSecond);
+      report.Add(scenario, "CPU us per switch", build.label, usage.microsecondsPerSwitch);
       std::printf("%s, %s, run %d: %.4f %% CPU, %.0f KiB resident\n", scenario.c_str(),
                   build.label.c_str(), run + 1, usage.cpuPercent, usage.residentKiB);
       std::fflush(stdout);
@@ -396,7 +398,10 @@ void RunMany(const Options& options, Report& report) {
 }
 
 // One channel whose peer is absent for a while and then starts listening;
-// the time from the listen to the accepted connection, repeatedly.
+// the time from the listen to the accepted connection, repeatedly. The
+// absences differ by a fraction of a second from trial to trial, so the
+// peer returns at every point of the back-off window (1 s by default), the
+// last moment of a window included.
 void RunReconnect(const Options& options, Report& report) {
   for (const Build& build : options.builds) {
     IdlePeers::RefusingPort port;
@@ -404,7 +409,7 @@ void RunReconnect(const Options& options, Report& report) {
     ChildHost child(build.host, Arguments(build, folder, {Tcp("127.0.0.1", port.Port())}));
     child.Send(ConnectLines(1));
     for (int trial = 0; trial < options.reconnects; ++trial) {
-      SleepSeconds(options.absentSeconds);
+      SleepSeconds(options.absentSeconds + static_cast<double>(trial) / options.reconnects);
       const auto start = Clock::now();
       if (!port.Listen()) {
         throw std::runtime_error("cannot listen on the refusing port");

@@ -120,7 +120,8 @@ class HostSocket final : public ISocket {
   enum class Handshake { Made, Refused, Stopped };
 
   // A TCP connection as the receiving side sees it. Guarded by
-  // receiveMutex_; IsBroken, Receive and Connect switch on it.
+  // receiveMutex_: Connect sets it, Receive and a peek of IsBroken end it,
+  // and IsBroken answers by it in one switch.
   enum class Link {
     kIdle,    // no attempt was made on this socket yet
     kOpen,    // connected, and the incoming stream has not ended
