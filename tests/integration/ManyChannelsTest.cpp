@@ -110,9 +110,12 @@ bool WaitUntil(const std::function<bool()>& condition, std::chrono::milliseconds
 
 TEST(ManyChannels, TwoHundredFiftySixChannelsStartConnectCarryAndStop) {
   const auto start = Clock::now();
+  // The channels, and the test's own ends of the TCP connections.
+  const std::size_t needed = DescriptorLimit::ForChannels(kChannels) + 2 * kTcp;
   std::string error;
-  ASSERT_TRUE(DescriptorLimit::Ensure(DescriptorLimit::ForChannels(kChannels) + 2 * kTcp, error))
-      << error;
+  if (!DescriptorLimit::Ensure(needed, error)) {
+    GTEST_SKIP() << "this machine's limit of open files is too low for the test: " << error;
+  }
   const TempDirectory folder;
   std::uint16_t refusing = 0;
   const FileDescriptor closed = LoopbackIo::ClosedTcpPort(refusing);
