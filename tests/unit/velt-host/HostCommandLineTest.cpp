@@ -152,9 +152,10 @@ TEST(HostCommandLine, ConnectBackoffTakesMillisecondsUpToAnHour) {
 
 TEST(HostCommandLine, ConnectBackoffOutOfRangeOrNoNumberIsRefused) {
   for (const char* value : {"3600001", "-1", "", "1s", " 5", "99999999", "1e3"}) {
-    EXPECT_EQ(ErrorOf({"--connect-backoff", value}),
-              std::string("option '--connect-backoff' needs milliseconds from 0 to 3600000, not '") +
-                  value + "'");
+    EXPECT_EQ(
+        ErrorOf({"--connect-backoff", value}),
+        std::string("option '--connect-backoff' needs milliseconds from 0 to 3600000, not '") +
+            value + "'");
   }
   EXPECT_EQ(ErrorOf({"--connect-backoff"}), "option '--connect-backoff' needs a value");
   EXPECT_EQ(ErrorOf({"--connect-backoff=5", "--connect-backoff=6"}),
