@@ -34,6 +34,7 @@
 #include "ChildHost.h"
 #include "HostSocketFactory.h"
 #include "IdlePeers.h"
+#include "TempDirectory.h"
 
 namespace {
 
@@ -79,30 +80,6 @@ void SleepSeconds(double seconds) {
   std::this_thread::sleep_for(std::chrono::duration<double>(seconds));
 }
 
-// A fresh folder for a run's storage file, removed afterwards.
-class ScratchFolder {
- public:
-  ScratchFolder() {
-    std::string pattern = "/tmp/velt-bench-idle-XXXXXX";
-    if (::mkdtemp(pattern.data()) == nullptr) {
-      throw std::runtime_error("mkdtemp failed");
-    }
-    path_ = pattern;
-  }
-  ScratchFolder(const ScratchFolder&) = delete;
-  ScratchFolder& operator=(const ScratchFolder&) = delete;
-  ScratchFolder(ScratchFolder&&) = delete;
-  ScratchFolder& operator=(ScratchFolder&&) = delete;
-  ~ScratchFolder() {
-    ::unlink(Storage().c_str());
-    ::rmdir(path_.c_str());
-  }
-  std::string Storage() const { return path_ + "/storage.ini"; }
-
- private:
-  std::string path_;
-};
-
 // The channels of one scenario: their configuration strings, and how many of
 // them are TCP channels that must be accepted before measuring.
 struct Channels {
@@ -126,10 +103,10 @@ std::string AbsentAddress(int index) {
   return "127.0." + std::to_string(1 + index / 250) + "." + std::to_string(1 + index % 250);
 }
 
-std::vector<std::string> Arguments(const Build& build, const ScratchFolder& folder,
+std::vector<std::string> Arguments(const Build& build, const TempDirectory& folder,
                                    const std::vector<std::string>& configs) {
-  std::vector<std::string> arguments = {"--plugin", build.plugin, "--storage", folder.Storage(),
-                                        "-q"};
+  std::vector<std::string> arguments = {"--plugin", build.plugin, "--storage",
+                                        folder.File("storage.ini"), "-q"};
   for (const std::string& config : configs) {
     arguments.push_back("--config");
     arguments.push_back(config);
@@ -159,7 +136,7 @@ struct Usage {
 
 Usage Measure(const Build& build, const Channels& channels, const IdlePeers::SilentAcceptor* tcp,
               double seconds) {
-  const ScratchFolder folder;
+  const TempDirectory folder;
   ChildHost child(build.host, Arguments(build, folder, channels.configs));
   if (!child.Send(ConnectLines(channels.configs.size()))) {
     throw std::runtime_error(build.label + ": velt-host ended at start-up");
@@ -405,7 +382,7 @@ void RunMany(const Options& options, Report& report) {
 void RunReconnect(const Options& options, Report& report) {
   for (const Build& build : options.builds) {
     IdlePeers::RefusingPort port;
-    const ScratchFolder folder;
+    const TempDirectory folder;
     ChildHost child(build.host, Arguments(build, folder, {Tcp("127.0.0.1", port.Port())}));
     child.Send(ConnectLines(1));
     for (int trial = 0; trial < options.reconnects; ++trial) {
