@@ -1,5 +1,9 @@
 #include "HostMultiTask.h"
 
+#include <poll.h>
+
+#include <algorithm>
+#include <cerrno>
 #include <chrono>
 #include <string>
 #include <system_error>
@@ -40,7 +44,22 @@ void HostMultiTask::Sleep(int milliseconds) {
     std::this_thread::yield();
     return;
   }
-  std::this_thread::sleep_for(std::chrono::milliseconds(milliseconds));
+  // On a host task the sleep also ends when the task is asked to stop, so a
+  // driver that idles between passes leaves as promptly as one that waits on
+  // its socket.
+  const int stopFd = HostTask::CurrentStopDescriptor();
+  if (stopFd < 0) {
+    std::this_thread::sleep_for(std::chrono::milliseconds(milliseconds));
+    return;
+  }
+  pollfd stop{stopFd, POLLIN, 0};
+  const auto deadline = std::chrono::steady_clock::now() + std::chrono::milliseconds(milliseconds);
+  int left = milliseconds;
+  while (::poll(&stop, 1, left) < 0 && errno == EINTR) {
+    const auto remaining =
+        std::chrono::ceil<std::chrono::milliseconds>(deadline - std::chrono::steady_clock::now());
+    left = static_cast<int>(std::max<std::chrono::milliseconds::rep>(remaining.count(), 0));
+  }
 }
 
 IMutex* HostMultiTask::CreateMutex() {
@@ -68,7 +87,7 @@ ITask* HostMultiTask::CreateTask(ITaskRunner* runner, int setting) {
   const std::lock_guard<std::mutex> lock(registryMutex_);
   std::shared_ptr<HostTask> task;
   try {
-    task = std::make_shared<HostTask>(runner, setting, TaskName(++taskCounter_));
+    task = std::make_shared<HostTask>(runner, setting, TaskName(++taskCounter_), taskStackBytes_);
   } catch (const std::system_error&) {
     return nullptr;
   }

@@ -9,12 +9,18 @@
 #include "HostTask.h"
 #include "IMultiTask2.h"
 
-// The multitasking service ("IMultiTask2") on standard threads. It owns every
+// The multitasking service ("IMultiTask2") on POSIX threads. It owns every
 // task and mutex it creates until they are deleted through it; handles it
 // did not create are refused.
 class HostMultiTask final : public IMultiTask2 {
  public:
-  HostMultiTask() = default;
+  // The stack of each task thread. A driver's worker needs a few KiB; the
+  // system's default (8 MiB) would cost a 32-bit panel 2 GiB of address
+  // space for 256 channels.
+  static constexpr std::size_t kDefaultTaskStackBytes = std::size_t{256} * 1024;
+
+  explicit HostMultiTask(std::size_t taskStackBytes = kDefaultTaskStackBytes)
+      : taskStackBytes_(taskStackBytes) {}
   HostMultiTask(const HostMultiTask&) = delete;
   HostMultiTask& operator=(const HostMultiTask&) = delete;
   HostMultiTask(HostMultiTask&&) = delete;
@@ -50,10 +56,12 @@ class HostMultiTask final : public IMultiTask2 {
   std::size_t LiveTasks() const;
   // Mutexes created and not yet deleted.
   std::size_t LiveMutexes() const;
+  std::size_t TaskStackBytes() const { return taskStackBytes_; }
 
  private:
   std::shared_ptr<HostTask> FindTask(const ITask* task) const;
 
+  const std::size_t taskStackBytes_;
   mutable std::mutex registryMutex_;
   std::map<const ITask*, std::shared_ptr<HostTask>> tasks_;
   std::map<const IMutex*, std::unique_ptr<HostMutex>> mutexes_;

@@ -19,10 +19,6 @@
 
 namespace {
 
-// One recv takes up to this much of a TCP stream; the driver then reads it a
-// byte at a time from memory.
-constexpr std::size_t kReceiveBufferSize = 4096;
-
 std::string SystemError(const char* what, int error) {
   return std::string(what) + ": " + std::generic_category().message(error);
 }
@@ -32,25 +28,26 @@ bool SetOption(int fd, int level, int option) {
   return ::setsockopt(fd, level, option, &on, sizeof on) == 0;
 }
 
-bool WouldBlock(int error) { return error == EAGAIN || error == EWOULDBLOCK; }
-
 }  // namespace
 
 std::unique_ptr<HostSocket> HostSocket::Create(bool tcp, unsigned short localPort,
-                                               Timeouts timeouts, std::string& error) {
+                                               Timeouts timeouts, Shared& shared,
+                                               std::string& error) {
   FileDescriptor fd = Open(tcp, error);
   if (!fd.Valid() || !Bind(fd.Get(), localPort, error)) {
     return nullptr;
   }
-  return std::unique_ptr<HostSocket>(new HostSocket(std::move(fd), tcp, localPort, timeouts));
+  return std::unique_ptr<HostSocket>(
+      new HostSocket(std::move(fd), tcp, localPort, timeouts, shared));
 }
 
 HostSocket::HostSocket(FileDescriptor fd, bool tcp, unsigned short configuredPort,
-                       Timeouts timeouts)
+                       Timeouts timeouts, Shared& shared)
     : fd_(std::move(fd)),
       tcp_(tcp),
       configuredPort_(configuredPort),
       timeouts_(timeouts),
+      shared_(shared),
       rxBuffer_(tcp ? kReceiveBufferSize : 0) {
   RecordLocalPort();
 }
@@ -118,7 +115,9 @@ HostSocket::WaitResult HostSocket::WaitFor(int fd, short events, Clock::time_poi
     if (fds[0].revents != 0) {
       return WaitResult::Ready;
     }
-    if (timeout == 0) {
+    // poll ran out its whole time-out, which was rounded up to reach the
+    // deadline: no second poll (and no clock read) is needed to tell.
+    if (rc == 0) {
       return WaitResult::TimedOut;
     }
   }
@@ -150,83 +149,6 @@ int HostSocket::ConnectUdp(const sockaddr_in& peer) {
   return 0;
 }
 
-int HostSocket::ConnectTcp(const sockaddr_in& peer) {
-  const std::lock_guard<std::mutex> lock(receiveMutex_);
-  if (needsRenewal_ && !Renew()) {
-    return -1;
-  }
-  needsRenewal_ = true;
-  connected_.store(false);
-  rxBegin_ = rxEnd_ = 0;
-  bool ok = ::connect(fd_.Get(), reinterpret_cast<const sockaddr*>(&peer), sizeof peer) == 0;
-  if (!ok && errno == EINPROGRESS) {
-    const Clock::time_point deadline = Clock::now() + timeouts_.connect;
-    if (WaitFor(fd_.Get(), POLLOUT, deadline) == WaitResult::Ready) {
-      int error = 0;
-      socklen_t length = sizeof error;
-      ok = ::getsockopt(fd_.Get(), SOL_SOCKET, SO_ERROR, &error, &length) == 0 && error == 0;
-    }
-  }
-  if (!ok) {
-    broken_.store(true);
-    // Abandon the attempt now, so no late handshake completes a connection
-    // nobody reads; the fresh descriptor is ready for the next Connect.
-    Renew();
-    return -1;
-  }
-  connected_.store(true);
-  broken_.store(false);
-  return 0;
-}
-
-bool HostSocket::Renew() {
-  std::string error;
-  FileDescriptor fresh = Open(tcp_, error);
-  if (!fresh.Valid()) {
-    return false;
-  }
-  {
-    const std::lock_guard<std::mutex> lock(sendMutex_);
-    connected_.store(false);
-    // dup2 closes the old socket (releasing its port) and puts the fresh one
-    // under the same number in one step.
-    if (::dup2(fresh.Get(), fd_.Get()) < 0) {
-      return false;
-    }
-  }
-  if (!Bind(fd_.Get(), configuredPort_, error)) {
-    // Left unbound: the next Connect renews again rather than connect from
-    // a port the system picks.
-    needsRenewal_ = true;
-    return false;
-  }
-  needsRenewal_ = false;
-  RecordLocalPort();
-  return true;
-}
-
-int HostSocket::IsBroken() {
-  if (!tcp_) {
-    return 0;
-  }
-  const std::lock_guard<std::mutex> lock(receiveMutex_);
-  if (broken_.load()) {
-    return 1;
-  }
-  if (!connected_.load() || rxBegin_ < rxEnd_) {
-    return 0;
-  }
-  // Peek, so a byte that is there stays for Receive; 0 means the peer closed
-  // after everything it sent has been taken.
-  unsigned char probe = 0;
-  const ssize_t n = ::recv(fd_.Get(), &probe, 1, MSG_PEEK | MSG_DONTWAIT);
-  if (n > 0 || (n < 0 && (WouldBlock(errno) || errno == EINTR))) {
-    return 0;
-  }
-  broken_.store(true);
-  return 1;
-}
-
 int HostSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMilliseconds) {
   if (buffer == nullptr || maxLength <= 0) {
     return -1;
@@ -237,7 +159,8 @@ int HostSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMillise
       timeoutMilliseconds < 0 ? Clock::time_point::max()
                               : Clock::now() + std::chrono::milliseconds(timeoutMilliseconds);
   const std::lock_guard<std::mutex> lock(receiveMutex_);
-  return tcp_ ? ReceiveTcp(buffer, maxLength, deadline) : ReceiveUdp(buffer, maxLength, deadline);
+  return tcp_ ? ReceiveTcp(buffer, maxLength, deadline)
+              : WaitAndTake(&HostSocket::TakeDatagram, buffer, maxLength, deadline);
 }
 
 int HostSocket::ServeBuffered(unsigned char* buffer, int maxLength) {
@@ -247,13 +170,12 @@ int HostSocket::ServeBuffered(unsigned char* buffer, int maxLength) {
   return static_cast<int>(count);
 }
 
-int HostSocket::ReceiveTcp(unsigned char* buffer, int maxLength, Clock::time_point deadline) {
-  if (rxBegin_ < rxEnd_) {
-    return ServeBuffered(buffer, maxLength);
-  }
-  if (!connected_.load() || broken_.load()) {
-    return -1;
-  }
+// Waits until the descriptor is readable, then takes what is there: 0 when
+// the time-out elapsed or the task was asked to stop, -1 when the wait
+// failed, otherwise take's answer. A readable descriptor that held nothing
+// after all is waited for again.
+int HostSocket::WaitAndTake(Take take, unsigned char* buffer, int maxLength,
+                            Clock::time_point deadline) {
   for (;;) {
     const WaitResult wait = WaitFor(fd_.Get(), POLLIN, deadline);
     if (wait == WaitResult::TimedOut || wait == WaitResult::Stopped) {
@@ -262,40 +184,21 @@ int HostSocket::ReceiveTcp(unsigned char* buffer, int maxLength, Clock::time_poi
     if (wait == WaitResult::Failed) {
       return -1;
     }
-    const ssize_t n = ::recv(fd_.Get(), rxBuffer_.data(), rxBuffer_.size(), MSG_DONTWAIT);
-    if (n > 0) {
-      rxBegin_ = 0;
-      rxEnd_ = static_cast<std::size_t>(n);
-      return ServeBuffered(buffer, maxLength);
+    const int taken = (this->*take)(buffer, maxLength);
+    if (taken != kNothingYet) {
+      return taken;
     }
-    if (n < 0 && (WouldBlock(errno) || errno == EINTR)) {
-      continue;
-    }
-    // 0: the peer closed; otherwise reset or failed.
-    broken_.store(true);
-    return -1;
   }
 }
 
-int HostSocket::ReceiveUdp(unsigned char* buffer, int maxLength, Clock::time_point deadline) {
-  for (;;) {
-    const WaitResult wait = WaitFor(fd_.Get(), POLLIN, deadline);
-    if (wait == WaitResult::TimedOut || wait == WaitResult::Stopped) {
-      return 0;
-    }
-    if (wait == WaitResult::Failed) {
-      return -1;
-    }
-    // One datagram per call; the kernel truncates it to the buffer and drops
-    // the rest.
-    const ssize_t n = ::recv(fd_.Get(), buffer, static_cast<std::size_t>(maxLength), MSG_DONTWAIT);
-    if (n >= 0) {
-      return static_cast<int>(n);
-    }
-    if (!WouldBlock(errno) && errno != EINTR) {
-      return -1;
-    }
+// One datagram per call; the kernel truncates it to the buffer and drops the
+// rest.
+int HostSocket::TakeDatagram(unsigned char* buffer, int maxLength) {
+  const ssize_t n = ::recv(fd_.Get(), buffer, static_cast<std::size_t>(maxLength), MSG_DONTWAIT);
+  if (n >= 0) {
+    return static_cast<int>(n);
   }
+  return WouldBlock(errno) || errno == EINTR ? kNothingYet : -1;
 }
 
 int HostSocket::GetAdapterInfo(unsigned int ip, unsigned int* address, unsigned int* mask,
@@ -310,36 +213,6 @@ int HostSocket::Send(const unsigned char* data, int length) {
   const std::lock_guard<std::mutex> lock(sendMutex_);
   const auto size = static_cast<std::size_t>(length);
   return tcp_ ? SendTcp(data, size) : SendUdp(data, size);
-}
-
-int HostSocket::SendTcp(const unsigned char* data, std::size_t length) {
-  if (!connected_.load() || broken_.load()) {
-    return -1;
-  }
-  const Clock::time_point deadline = Clock::now() + timeouts_.send;
-  std::size_t sent = 0;
-  while (sent < length) {
-    const ssize_t n = ::send(fd_.Get(), data + sent, length - sent, MSG_NOSIGNAL | MSG_DONTWAIT);
-    if (n > 0) {
-      sent += static_cast<std::size_t>(n);
-      continue;
-    }
-    if (n < 0 && errno == EINTR) {
-      continue;
-    }
-    const bool full = n < 0 && WouldBlock(errno);
-    if (full && WaitWritable(deadline)) {
-      continue;
-    }
-    if (!full || sent > 0) {
-      // A failed connection, or a frame cut in two: either way the stream
-      // can carry nothing more.
-      broken_.store(true);
-      ::shutdown(fd_.Get(), SHUT_RDWR);
-    }
-    return -1;
-  }
-  return static_cast<int>(length);
 }
 
 int HostSocket::SendUdp(const unsigned char* data, std::size_t length) {

@@ -10,7 +10,8 @@ int HostSocketFactory::GetImpVersion() const { return 100; }
 
 ISocket* HostSocketFactory::CreateSocket(unsigned short localPort, int tcp, int /*flags*/) {
   std::string error;
-  std::unique_ptr<HostSocket> socket = HostSocket::Create(tcp != 0, localPort, timeouts_, error);
+  std::unique_ptr<HostSocket> socket =
+      HostSocket::Create(tcp != 0, localPort, timeouts_, shared_, error);
   const std::lock_guard<std::mutex> lock(mutex_);
   if (socket == nullptr) {
     lastError_ = error;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -11,12 +12,15 @@
 
 // The socket service ("ISocketFactory", second generation) on BSD sockets.
 // It owns every socket it creates until DeleteSocket; sockets still open
-// when the factory is destroyed are closed then.
+// when the factory is destroyed are closed then. Its TCP sockets share one
+// connect pacing (HostSocket, ConnectPacing), so a socket made again for a
+// target that refuses connections keeps the target's back-off window.
 class HostSocketFactory final : public ISocketFactory2 {
  public:
   // Sockets with the default time-outs of HostSocket::Timeouts.
-  HostSocketFactory() = default;
-  explicit HostSocketFactory(HostSocket::Timeouts timeouts) : timeouts_(timeouts) {}
+  HostSocketFactory() : HostSocketFactory(HostSocket::Timeouts()) {}
+  explicit HostSocketFactory(HostSocket::Timeouts timeouts)
+      : timeouts_(timeouts), shared_(timeouts.connectBackoff) {}
   HostSocketFactory(const HostSocketFactory&) = delete;
   HostSocketFactory& operator=(const HostSocketFactory&) = delete;
   HostSocketFactory(HostSocketFactory&&) = delete;
@@ -43,9 +47,14 @@ class HostSocketFactory final : public ISocketFactory2 {
   // Why the last CreateSocket failed; empty if none failed.
   std::string LastError() const;
   HostSocket::Timeouts Timeouts() const { return timeouts_; }
+  // TCP connect attempts that reached the network (those refused inside a
+  // back-off window are not counted), over every socket made here.
+  std::uint64_t ConnectAttempts() const { return shared_.connectAttempts.load(); }
+  const ConnectPacing& Pacing() const { return shared_.pacing; }
 
  private:
   const HostSocket::Timeouts timeouts_{};
+  HostSocket::Shared shared_;
   mutable std::mutex mutex_;
   std::map<const ISocket*, std::unique_ptr<HostSocket>> sockets_;
   std::string lastError_;

@@ -4,6 +4,7 @@
 #include <sys/eventfd.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdint>
 #include <cstdio>
@@ -33,20 +34,56 @@ FileDescriptor OpenStopSignal() {
   return fd;
 }
 
+// Owns a set of thread attributes.
+class ThreadAttributes {
+ public:
+  ThreadAttributes() : ok_(::pthread_attr_init(&attributes_) == 0) {}
+  ThreadAttributes(const ThreadAttributes&) = delete;
+  ThreadAttributes& operator=(const ThreadAttributes&) = delete;
+  ThreadAttributes(ThreadAttributes&&) = delete;
+  ThreadAttributes& operator=(ThreadAttributes&&) = delete;
+  ~ThreadAttributes() {
+    if (ok_) {
+      ::pthread_attr_destroy(&attributes_);
+    }
+  }
+
+  // A stack of stackBytes, raised to the system's minimum; 0 keeps the
+  // default.
+  bool SetStack(std::size_t stackBytes) {
+    if (!ok_ || stackBytes == 0) {
+      return ok_;
+    }
+    const long minimum = ::sysconf(_SC_THREAD_STACK_MIN);
+    const std::size_t size =
+        std::max(stackBytes, minimum > 0 ? static_cast<std::size_t>(minimum) : stackBytes);
+    return ::pthread_attr_setstacksize(&attributes_, size) == 0;
+  }
+  const pthread_attr_t* Get() const { return &attributes_; }
+
+ private:
+  pthread_attr_t attributes_{};
+  bool ok_;
+};
+
 }  // namespace
 
-HostTask::HostTask(ITaskRunner* runner, int setting, std::string name)
-    : runner_(runner), setting_(setting), name_(std::move(name)), stopSignal_(OpenStopSignal()) {}
+HostTask::HostTask(ITaskRunner* runner, int setting, std::string name, std::size_t stackBytes)
+    : runner_(runner),
+      setting_(setting),
+      name_(std::move(name)),
+      stackBytes_(stackBytes),
+      stopSignal_(OpenStopSignal()) {}
 
 HostTask::~HostTask() {
   RequestStop();
-  std::thread thread;
+  bool join = false;
   {
     const std::lock_guard<std::mutex> lock(stateMutex_);
-    thread = std::move(thread_);
+    join = std::exchange(joinable_, false);
   }
-  if (thread.joinable()) {
-    thread.join();
+  if (join) {
+    ::pthread_join(thread_, nullptr);
   }
 }
 
@@ -57,13 +94,19 @@ bool HostTask::Start() {
   if (started_) {
     return false;
   }
-  try {
-    thread_ = std::thread(&HostTask::Run, this);
-  } catch (const std::system_error&) {
+  ThreadAttributes attributes;
+  if (!attributes.SetStack(stackBytes_) ||
+      ::pthread_create(&thread_, attributes.Get(), &HostTask::Enter, this) != 0) {
     return false;
   }
   started_ = true;
+  joinable_ = true;
   return true;
+}
+
+void* HostTask::Enter(void* task) noexcept {
+  static_cast<HostTask*>(task)->Run();
+  return nullptr;
 }
 
 void HostTask::RequestStop() {
@@ -99,7 +142,7 @@ int HostTask::CurrentStopDescriptor() {
   return task == nullptr ? -1 : task->stopSignal_.Get();
 }
 
-void HostTask::Run() {
+void HostTask::Run() noexcept {
   CurrentTask() = this;
   // Debuggers show the name; the kernel keeps at most 15 characters.
   const std::string shortName = name_.substr(0, 15);

@@ -1,11 +1,13 @@
 #pragma once
 
+#include <pthread.h>
+
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
+#include <cstddef>
 #include <mutex>
 #include <string>
-#include <thread>
 
 #include "FileDescriptor.h"
 #include "IMultiTask2.h"
@@ -17,8 +19,10 @@
 // thread can wake at once (HostSocket polls it beside the socket).
 class HostTask final : public ITask {
  public:
-  // Throws std::system_error when the stop descriptor cannot be created.
-  HostTask(ITaskRunner* runner, int setting, std::string name);
+  // The thread gets stackBytes of stack (at least the system's minimum); 0
+  // keeps the system's default. Throws std::system_error when the stop
+  // descriptor cannot be created.
+  HostTask(ITaskRunner* runner, int setting, std::string name, std::size_t stackBytes = 0);
   HostTask(const HostTask&) = delete;
   HostTask& operator=(const HostTask&) = delete;
   HostTask(HostTask&&) = delete;
@@ -41,6 +45,7 @@ class HostTask final : public ITask {
 
   int Setting() const { return setting_; }
   const std::string& Name() const { return name_; }
+  std::size_t StackBytes() const { return stackBytes_; }
 
   // The task whose thread is calling, or null on a thread that is no host
   // task.
@@ -49,11 +54,13 @@ class HostTask final : public ITask {
   static int CurrentStopDescriptor();
 
  private:
-  void Run();
+  static void* Enter(void* task) noexcept;
+  void Run() noexcept;
 
   ITaskRunner* const runner_;
   const int setting_;
   const std::string name_;
+  const std::size_t stackBytes_;
   FileDescriptor stopSignal_;
   std::atomic<bool> stopping_{false};
 
@@ -61,5 +68,7 @@ class HostTask final : public ITask {
   std::condition_variable endedChanged_;
   bool started_ = false;
   bool ended_ = false;
-  std::thread thread_;
+  // Set while a started thread waits to be joined.
+  bool joinable_ = false;
+  pthread_t thread_{};
 };

@@ -58,8 +58,14 @@ TEST_F(ChannelStress, WorkerReadersWritersAndAppliesRunTogether) {
       }
     }
   });
+  // Each apply discards the queue, and on a busy machine the worker may
+  // not run at all while the first datagrams go out: the source goes on
+  // (for ten seconds at most) until the reader has seen a token, so the
+  // reads always overlap with a stream that reaches the queue.
   std::thread source([&] {
-    for (int i = 0; i < kDatagrams; ++i) {
+    const auto deadline = std::chrono::steady_clock::now() + 10s;
+    for (int i = 0;
+         i < kDatagrams || (read.load() == 0 && std::chrono::steady_clock::now() < deadline); ++i) {
       LoopbackIo::SendTo(peer.Get(), local,
                          LoopbackIo::FromText("token " + std::to_string(i) + "\n"));
       if (i % 64 == 0) {

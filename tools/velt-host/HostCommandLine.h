@@ -12,9 +12,9 @@ namespace velthost {
 //   velt-host --help | --version
 // Options: --plugin PATH, --storage PATH, --config STRING (repeatable),
 // --config-file FILE (repeatable), --ident NAME (repeatable), -c COMMAND
-// (repeatable), -q/--quiet. Long options take their value as the next
-// argument or after "=". --help and --version end the scan where they
-// stand.
+// (repeatable), -q/--quiet, --connect-backoff MS. Long options take their
+// value as the next argument or after "=". --help and --version end the
+// scan where they stand.
 class HostCommandLine {
  public:
   // False with Error() set for a bad command line.
@@ -27,12 +27,15 @@ class HostCommandLine {
   // The name of the instance at index (from 0) that no --ident names: VELT,
   // VELT2, VELT3, ...
   static std::string DefaultName(std::size_t index);
+  // The largest --connect-backoff: an hour.
+  static constexpr long kMaxConnectBackoff = 3600000;
 
  private:
   bool TakeValue(const std::vector<std::string>& arguments, std::size_t& index,
                  const std::string& name, std::string& value);
   bool TakeOption(const std::vector<std::string>& arguments, std::size_t& index, bool& known);
   bool TakeAction(const std::string& word, bool& actionGiven);
+  bool TakeBackoff(const std::string& value);
   bool Check();
   bool NameInstances();
   bool Fail(const std::string& text);

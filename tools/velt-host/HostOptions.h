@@ -1,5 +1,7 @@
 #pragma once
 
+#include <chrono>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -33,6 +35,9 @@ struct HostOptions {
   // -c commands in order; run instead of reading standard input when any.
   std::vector<std::string> commands;
   bool quiet = false;
+  // The longest back-off between connect attempts to a refusing peer; none
+  // keeps the host's default.
+  std::optional<std::chrono::milliseconds> connectBackoff;
 };
 
 }  // namespace velthost

@@ -10,6 +10,7 @@
 #include <stdexcept>
 
 #include "DescriptionBlock.h"
+#include "DescriptorLimit.h"
 #include "velt-host/CommandListInput.h"
 #include "velt-host/ConfigFile.h"
 #include "velt-host/Console.h"
@@ -170,7 +171,16 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
   const std::string pluginPath = PluginPath(options);
   const std::string storagePath = StoragePath(options);
   const std::vector<std::string> configs = ConfigStrings(options);
-  PluginSession session(pluginPath, storagePath);
+  std::string limitError;
+  if (!DescriptorLimit::Ensure(DescriptorLimit::ForChannels(configs.size()), limitError)) {
+    throw std::runtime_error("cannot run " + std::to_string(configs.size()) +
+                             " instances: " + limitError);
+  }
+  HostSocket::Timeouts timeouts;
+  if (options.connectBackoff.has_value()) {
+    timeouts.connectBackoff = *options.connectBackoff;
+  }
+  PluginSession session(pluginPath, storagePath, timeouts);
   for (std::size_t i = 0; i < configs.size(); ++i) {
     session.AddInstance(options.names[i], configs[i]);
   }

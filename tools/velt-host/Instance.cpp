@@ -9,7 +9,7 @@
 namespace velthost {
 
 Instance::Instance(IProtocolFactory& factory, const std::string& name, const std::string& config)
-    : name_(name), handle_(factory), reply_(kReplyBytes) {
+    : name_(name), handle_(factory) {
   IProtocol& protocol = handle_.Get();
   protocol.SetIdent(name.c_str());
   if (!protocol.Config(config.c_str())) {
@@ -32,10 +32,12 @@ std::string Instance::LastError() const {
   return text == nullptr ? std::string() : std::string(text);
 }
 
+// The reply buffer lives for one command only: kept per instance it would
+// hold 64 KiB of every channel resident for nothing.
 bool Instance::Command(const std::string& line, std::string& reply) {
-  reply_[0] = '\0';
-  const bool ok = handle_.Get().DoCommand(line.c_str(), reply_.data(), kReplyBytes);
-  reply.assign(reply_.data(), strnlen(reply_.data(), reply_.size()));
+  std::vector<char> buffer(kReplyBytes, '\0');
+  const bool ok = handle_.Get().DoCommand(line.c_str(), buffer.data(), kReplyBytes);
+  reply.assign(buffer.data(), strnlen(buffer.data(), buffer.size()));
   return ok;
 }
 

@@ -49,7 +49,6 @@ class Instance {
   std::string name_;
   ProtocolHandle handle_;
   bool started_ = false;
-  std::vector<char> reply_;
 };
 
 }  // namespace velthost

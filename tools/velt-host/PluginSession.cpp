@@ -6,9 +6,10 @@
 
 namespace velthost {
 
-PluginSession::PluginSession(const std::string& pluginPath, const std::string& storagePath) {
+PluginSession::PluginSession(const std::string& pluginPath, const std::string& storagePath,
+                             HostSocket::Timeouts socketTimeouts) {
   try {
-    host_ = std::make_unique<HostInterfaceFactory>(storagePath);
+    host_ = std::make_unique<HostInterfaceFactory>(storagePath, socketTimeouts);
   } catch (const StorageError& e) {
     throw std::runtime_error(std::string("cannot read the storage file ") + e.what());
   }

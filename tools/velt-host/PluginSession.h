@@ -19,7 +19,8 @@ class PluginSession {
   // Throws std::runtime_error naming what failed: the storage file, the
   // loader's text, or the module's. An empty storage path gives a host
   // without permanent storage.
-  PluginSession(const std::string& pluginPath, const std::string& storagePath);
+  PluginSession(const std::string& pluginPath, const std::string& storagePath,
+                HostSocket::Timeouts socketTimeouts = HostSocket::Timeouts());
   PluginSession(const PluginSession&) = delete;
   PluginSession& operator=(const PluginSession&) = delete;
   PluginSession(PluginSession&&) = delete;

@@ -112,3 +112,13 @@ TEST(HostInterfaceFactory, PassesSocketTimeoutsOn) {
   EXPECT_EQ(host.SocketFactory().Timeouts().connect, std::chrono::milliseconds(500));
   EXPECT_EQ(host.SocketFactory().Timeouts().send, std::chrono::milliseconds(700));
 }
+
+TEST(HostInterfaceFactory, ConnectBackoffCeilingIsAnOptionOfTheHost) {
+  HostInterfaceFactory byDefault("");
+  EXPECT_EQ(byDefault.SocketFactory().Pacing().Ceiling(), std::chrono::milliseconds(1000));
+  HostInterfaceFactory host(
+      "", HostSocket::Timeouts{std::chrono::milliseconds(500), std::chrono::milliseconds(700),
+                               std::chrono::milliseconds(250)});
+  EXPECT_EQ(host.SocketFactory().Timeouts().connectBackoff, std::chrono::milliseconds(250));
+  EXPECT_EQ(host.SocketFactory().Pacing().Ceiling(), std::chrono::milliseconds(250));
+}

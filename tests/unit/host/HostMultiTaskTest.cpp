@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 #include <pthread.h>
+#include <unistd.h>
 
 #include <atomic>
 #include <chrono>
@@ -218,6 +219,97 @@ TEST(HostMultiTask, WorkerThreadsCarryAReadableName) {
   ASSERT_EQ(tasks.DeleteTask(task, 1000), 1);
   EXPECT_EQ(name, "velt-task-1");
   EXPECT_EQ(static_cast<std::size_t>(15), std::strlen("velt-task-99999"));
+}
+
+// The stack a task's thread was given, as the thread sees it.
+std::size_t StackOfATask(HostMultiTask& tasks) {
+  std::size_t stack = 0;
+  std::atomic<bool> done{false};
+  FunctionRunner runner([&] {
+    pthread_attr_t attributes;
+    if (::pthread_getattr_np(::pthread_self(), &attributes) == 0) {
+      ::pthread_attr_getstacksize(&attributes, &stack);
+      ::pthread_attr_destroy(&attributes);
+    }
+    done = true;
+  });
+  ITask* const task = tasks.CreateTask(&runner, 3);
+  EXPECT_EQ(tasks.StartTask(task), 1);
+  EXPECT_TRUE(WaitFor(done));
+  EXPECT_EQ(tasks.DeleteTask(task, 1000), 1);
+  return stack;
+}
+
+// The stack the system gives a thread by default.
+std::size_t DefaultStack() {
+  std::size_t stack = 0;
+  std::thread([&stack] {
+    pthread_attr_t attributes;
+    if (::pthread_getattr_np(::pthread_self(), &attributes) == 0) {
+      ::pthread_attr_getstacksize(&attributes, &stack);
+      ::pthread_attr_destroy(&attributes);
+    }
+  }).join();
+  return stack;
+}
+
+// The C library (or a sanitizer's runtime) may hand a thread the cached,
+// larger stack of a finished one; never less than asked, and never the
+// system's default.
+void ExpectStackOf(std::size_t stack, std::size_t asked) {
+  EXPECT_GE(stack, asked);
+  EXPECT_LT(stack, DefaultStack());
+}
+
+TEST(HostMultiTask, TaskThreadsGetAQuarterMebibyteOfStack) {
+  HostMultiTask tasks;
+  EXPECT_EQ(tasks.TaskStackBytes(), 256U * 1024U);
+  ExpectStackOf(StackOfATask(tasks), 256U * 1024U);
+}
+
+TEST(HostMultiTask, TaskStackIsChosenAtConstruction) {
+  HostMultiTask large(1024 * 1024);
+  ExpectStackOf(StackOfATask(large), 1024U * 1024U);
+  // Below the system's minimum the minimum is taken.
+  HostMultiTask tiny(1);
+  ExpectStackOf(StackOfATask(tiny), static_cast<std::size_t>(::sysconf(_SC_THREAD_STACK_MIN)));
+}
+
+TEST(HostMultiTask, SleepOnATaskEndsWhenTheTaskIsAskedToStop) {
+  HostMultiTask tasks;
+  std::atomic<bool> entered{false};
+  std::atomic<bool> slept{false};
+  FunctionRunner runner([&] {
+    entered = true;
+    tasks.Sleep(60000);
+    slept = true;
+  });
+  ITask* const task = tasks.CreateTask(&runner, 3);
+  ASSERT_EQ(tasks.StartTask(task), 1);
+  ASSERT_TRUE(WaitFor(entered));
+  std::this_thread::sleep_for(milliseconds(20));
+  EXPECT_FALSE(slept.load());
+  const auto start = Clock::now();
+  EXPECT_EQ(tasks.DeleteTask(task, 5000), 1);
+  EXPECT_LT(Clock::now() - start, milliseconds(1000));
+  EXPECT_TRUE(slept.load());
+}
+
+TEST(HostMultiTask, SleepOnATaskLastsTheGivenTime) {
+  HostMultiTask tasks;
+  std::atomic<bool> done{false};
+  Clock::duration slept{};
+  FunctionRunner runner([&] {
+    const auto start = Clock::now();
+    tasks.Sleep(30);
+    slept = Clock::now() - start;
+    done = true;
+  });
+  ITask* const task = tasks.CreateTask(&runner, 3);
+  ASSERT_EQ(tasks.StartTask(task), 1);
+  ASSERT_TRUE(WaitFor(done));
+  EXPECT_EQ(tasks.DeleteTask(task, 1000), 1);
+  EXPECT_GE(slept, milliseconds(30));
 }
 
 TEST(HostMultiTask, RunnerRunsOnItsOwnThreadAsTheCurrentTask) {

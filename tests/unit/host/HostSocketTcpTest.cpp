@@ -2,6 +2,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <iterator>
 #include <memory>
 #include <thread>
 #include <vector>
@@ -187,6 +188,49 @@ TEST_F(ConnectedTcp, BytesSentBeforeACloseAreReceivedBeforeTheBreakShows) {
   EXPECT_EQ(socket_->IsBroken(), 0);
   EXPECT_EQ(ReceiveByteWise(2), LoopbackIo::FromText("bc"));
   EXPECT_EQ(socket_->IsBroken(), 1);
+}
+
+TEST_F(ConnectedTcp, BytesSentBeforeAResetAreReceivedBeforeTheBreakShows) {
+  LoopbackIo::SendAll(peer_.Get(), LoopbackIo::FromText("abc"));
+  LoopbackIo::Reset(peer_);
+  std::this_thread::sleep_for(milliseconds(50));
+  EXPECT_EQ(socket_->IsBroken(), 0);
+  EXPECT_EQ(ReceiveByteWise(3), LoopbackIo::FromText("abc"));
+  EXPECT_EQ(socket_->IsBroken(), 1);
+  unsigned char byte = 0;
+  EXPECT_EQ(socket_->Receive(&byte, 1, 100), -1);
+}
+
+TEST_F(ConnectedTcp, AFailedSendDoesNotHideBytesThatArrived) {
+  LoopbackIo::SendAll(peer_.Get(), LoopbackIo::FromText("xyz"));
+  LoopbackIo::Reset(peer_);
+  std::this_thread::sleep_for(milliseconds(50));
+  const Bytes frame = LoopbackIo::FromText("late");
+  EXPECT_EQ(socket_->Send(frame.data(), static_cast<int>(frame.size())), -1);
+  // The send found the connection reset, but what the peer sent first is
+  // still to be received.
+  EXPECT_EQ(socket_->IsBroken(), 0);
+  EXPECT_EQ(ReceiveByteWise(3), LoopbackIo::FromText("xyz"));
+  EXPECT_EQ(socket_->IsBroken(), 1);
+  EXPECT_EQ(socket_->Send(frame.data(), static_cast<int>(frame.size())), -1);
+}
+
+TEST_F(ConnectedTcp, ReceivesOfAnySizeReturnTheStreamInOrder) {
+  const Bytes sent = LoopbackIo::Pattern(40000, 5);
+  std::thread writer([&] { LoopbackIo::SendAll(peer_.Get(), sent); });
+  // Small receives are served from the internal buffer, large ones take the
+  // stream straight into the caller's buffer.
+  const int sizes[] = {1, 3, 4096, 7, 8192, 1, 4095, 65536, 2};
+  Bytes received;
+  Bytes buffer(65536);
+  for (std::size_t i = 0; received.size() < sent.size(); ++i) {
+    const int n = socket_->Receive(buffer.data(), sizes[i % std::size(sizes)], 2000);
+    ASSERT_GT(n, 0);
+    ASSERT_LE(n, sizes[i % std::size(sizes)]);
+    received.insert(received.end(), buffer.begin(), buffer.begin() + n);
+  }
+  writer.join();
+  EXPECT_EQ(received, sent);
 }
 
 TEST_F(ConnectedTcp, ClosedPeerMakesReceiveFailAndBreaks) {

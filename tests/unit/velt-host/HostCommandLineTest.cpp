@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <string>
 #include <vector>
 
@@ -31,6 +32,7 @@ TEST(HostCommandLine, NoArgumentsIsTheConsoleWithDefaults) {
   EXPECT_TRUE(options.names.empty());
   EXPECT_TRUE(options.commands.empty());
   EXPECT_FALSE(options.quiet);
+  EXPECT_FALSE(options.connectBackoff.has_value());
 }
 
 TEST(HostCommandLine, ConfigsAndFilesKeepTheirOrderAndGetDefaultNames) {
@@ -138,11 +140,48 @@ TEST(HostCommandLine, ActionsTakeNoConsoleOptions) {
             "demo takes no --config, --config-file, --ident, --storage or -c");
 }
 
+TEST(HostCommandLine, ConnectBackoffTakesMillisecondsUpToAnHour) {
+  HostCommandLine commandLine;
+  ASSERT_TRUE(commandLine.Parse({"--connect-backoff", "250"}));
+  EXPECT_EQ(commandLine.Options().connectBackoff, std::chrono::milliseconds(250));
+  ASSERT_TRUE(commandLine.Parse({"--connect-backoff=0"}));
+  EXPECT_EQ(commandLine.Options().connectBackoff, std::chrono::milliseconds(0));
+  ASSERT_TRUE(commandLine.Parse({"--connect-backoff=3600000"}));
+  EXPECT_EQ(commandLine.Options().connectBackoff, std::chrono::milliseconds(3600000));
+}
+
+TEST(HostCommandLine, ConnectBackoffOutOfRangeOrNoNumberIsRefused) {
+  for (const char* value : {"3600001", "-1", "", "1s", " 5", "99999999", "1e3"}) {
+    EXPECT_EQ(
+        ErrorOf({"--connect-backoff", value}),
+        std::string("option '--connect-backoff' needs milliseconds from 0 to 3600000, not '") +
+            value + "'");
+  }
+  EXPECT_EQ(ErrorOf({"--connect-backoff"}), "option '--connect-backoff' needs a value");
+  EXPECT_EQ(ErrorOf({"--connect-backoff=5", "--connect-backoff=6"}),
+            "option '--connect-backoff' given twice");
+  EXPECT_EQ(ErrorOf({"demo", "--connect-backoff", "5"}), "demo takes no --connect-backoff");
+}
+
+TEST(HostCommandLine, TwoHundredFiftySixInstancesAreNamedAndCheckedOnce) {
+  Words arguments;
+  for (int i = 0; i < 256; ++i) {
+    arguments.insert(arguments.end(), {"--config", "x"});
+  }
+  HostCommandLine commandLine;
+  ASSERT_TRUE(commandLine.Parse(arguments));
+  ASSERT_EQ(commandLine.Options().names.size(), 256U);
+  EXPECT_EQ(commandLine.Options().names[255], "VELT256");
+  arguments.insert(arguments.end(), {"--ident", "A", "--ident", "VELT256"});
+  EXPECT_EQ(ErrorOf(arguments), "two instances are named 'VELT256'");
+}
+
 TEST(HostCommandLine, UsageNamesEveryOption) {
   const std::string usage = HostCommandLine::Usage();
   for (const char* option :
        {"--plugin PATH", "--storage PATH", "--config STRING", "--config-file FILE", "--ident NAME",
-        "-c COMMAND", "-q, --quiet", "--help", "--version", " xml ", " info ", " demo "}) {
+        "-c COMMAND", "-q, --quiet", "--connect-backoff MS", "--help", "--version", " xml ",
+        " info ", " demo "}) {
     EXPECT_NE(usage.find(option), std::string::npos) << option;
   }
 }
