@@ -2,6 +2,7 @@
 
 #include <unistd.h>
 
+#include <atomic>
 #include <clocale>
 #include <csignal>
 #include <cstdlib>
@@ -18,6 +19,7 @@
 #include "velt-host/HostCommandLine.h"
 #include "velt-host/PluginSession.h"
 #include "velt-host/ProtocolHandle.h"
+#include "velt-host/StoredSettings.h"
 #include "velt-host/StreamInput.h"
 #include "velt-host/TerminalInput.h"
 
@@ -170,11 +172,37 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
   const std::string pluginPath = PluginPath(options);
   const std::string storagePath = StoragePath(options);
   const std::vector<std::string> configs = ConfigStrings(options);
-  PluginSession session(pluginPath, storagePath);
-  for (std::size_t i = 0; i < configs.size(); ++i) {
-    session.AddInstance(options.names[i], configs[i]);
+  // Storage failures are reported on the thread that applied: the console's.
+  std::atomic<bool> storageFailed{false};
+  bool commandFailed = false;
+  {
+    PluginSession session(pluginPath, storagePath,
+                          [&output, &storageFailed](const StorageFailure& failure) {
+                            output.Error(failure.Text());
+                            storageFailed = true;
+                          });
+    WarnOfStoredSettings(session, options, configs.size(), output);
+    for (std::size_t i = 0; i < configs.size(); ++i) {
+      session.AddInstance(options.names[i], configs[i]);
+    }
+    commandFailed = RunCommands(options, signals, output, session, terminal);
   }
+  return commandFailed || storageFailed ? kFailed : kSucceeded;
+}
 
+void HostProgram::WarnOfStoredSettings(PluginSession& session, const HostOptions& options,
+                                       std::size_t instances, ConsoleOutput& output) {
+  HostPermanentStorage* const storage = session.Host().Storage();
+  for (std::size_t i = 0; storage != nullptr && i < instances; ++i) {
+    for (const std::string& warning : StoredSettings::Warnings(*storage, options.names[i])) {
+      output.Error("warning: " + warning);
+    }
+  }
+}
+
+// True when a command failed.
+bool HostProgram::RunCommands(const HostOptions& options, StopSignals& signals,
+                              ConsoleOutput& output, PluginSession& session, bool terminal) {
   const Console* console = nullptr;
   const auto prompt = [&console]() {
     return console == nullptr ? std::string() : console->Prompt();
@@ -195,14 +223,15 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
   Console running(session.Instances(), output, *input);
   console = &running;
   if (terminal && options.commands.empty()) {
-    output.Message(HostCommandLine::Version() + ": plug-in " + pluginPath + ", storage " +
-                   storagePath);
+    const HostPermanentStorage* const storage = session.Host().Storage();
+    output.Message(HostCommandLine::Version() + ": plug-in " + PluginPath(options) + ", storage " +
+                   (storage == nullptr ? std::string("none") : storage->Path()));
     output.Message(session.Instances().empty() ? "no instance (--config creates one)"
                                                : "instances: " + Join(session.Instances()));
     output.Message(".help lists the host's commands, help the instance's; .quit or Ctrl-D leaves");
   }
   running.RunAll();
-  return running.Failed() ? kFailed : kSucceeded;
+  return running.Failed();
 }
 
 }  // namespace velthost

@@ -10,6 +10,8 @@
 
 namespace velthost {
 
+class PluginSession;
+
 // velt-host from its command line to its exit status: 0 when every command
 // succeeded, 1 when one failed or start-up failed, 2 for a bad command line.
 class HostProgram {
@@ -25,6 +27,10 @@ class HostProgram {
  private:
   static int RunAction(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
   static int RunConsole(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
+  static void WarnOfStoredSettings(PluginSession& session, const HostOptions& options,
+                                   std::size_t instances, ConsoleOutput& output);
+  static bool RunCommands(const HostOptions& options, StopSignals& signals, ConsoleOutput& output,
+                          PluginSession& session, bool terminal);
   static int PrintXml(const std::string& pluginPath, ConsoleOutput& output);
   static int PrintInfo(const std::string& pluginPath, ConsoleOutput& output);
   static std::string PluginPath(const HostOptions& options);
