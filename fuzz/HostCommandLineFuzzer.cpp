@@ -61,9 +61,13 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       size == 0 ? std::vector<std::string>() : FuzzInput::Split(input.Rest(), '\0', kMostArguments);
   velthost::HostCommandLine commandLine;
   const bool accepted = commandLine.Parse(arguments);
+  const velthost::Action action = commandLine.Options().action;
   if (accepted) {
     Require(commandLine.Error().empty(), "an accepted command line has no error");
-    CheckAccepted(commandLine.Options());
+    // --help and --version end the scan where they stand.
+    if (action != velthost::Action::kHelp && action != velthost::Action::kVersion) {
+      CheckAccepted(commandLine.Options());
+    }
   } else {
     const std::string& error = commandLine.Error();
     Require(Documented(error), "a refusal is one of the documented reasons");

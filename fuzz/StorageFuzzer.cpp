@@ -153,13 +153,13 @@ void CheckChannelStart(HostPermanentStorage& storage, const std::string& section
   host.Offer("IPermanentStorage", &storage);
   ProtModule module;
   Require(module.Init(&host) == 1, "the module binds the storage");
-  // The identity is a C text: a section name with a zero byte is cut there.
-  const std::string ident = section.c_str();
-  const auto found = sections.find(ident);
-  const StoredEntries entries = found == sections.end() ? StoredEntries() : found->second;
   {
     Protocol_VELT channel;
-    channel.SetIdent(ident.c_str());
+    // The identity is a C text, cut at a zero byte; an empty one is the
+    // driver's name.
+    channel.SetIdent(section.c_str());
+    const auto found = sections.find(channel.GetIdent());
+    const StoredEntries entries = found == sections.end() ? StoredEntries() : found->second;
     Require(channel.Config(kConfig), "the configuration is accepted");
     channel.Start();
     const ChannelSettings read = channel.getSettings();
