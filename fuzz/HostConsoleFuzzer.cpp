@@ -19,14 +19,11 @@
 #include <string>
 #include <vector>
 
-#include "FakeMultiTask.h"
+#include "BoundModule.h"
 #include "FuzzInput.h"
 #include "MemoryStorage.h"
-#include "RecordingHostFactory.h"
 #include "Require.h"
-#include "ScriptedSocketFactory.h"
 #include "driver/Protocol_VELT.h"
-#include "factory/ProtModule.h"
 #include "factory/ProtocolFactory.h"
 #include "velt-host/Console.h"
 #include "velt-host/ConsoleOutput.h"
@@ -127,16 +124,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   FuzzInput input(data, size);
   const std::uint8_t flags = input.Byte();
   const std::vector<std::string> lines = FuzzInput::Split(input.Rest(), '\n', kMostLines);
-  FakeMultiTask tasks;
-  ScriptedSocketFactory sockets;
   MemoryStorage storage;
-  RecordingHostFactory host;
-  host.Offer("IMultiTask2", &tasks);
-  host.Offer("ISocketFactory", &sockets);
-  host.Offer("IPermanentStorage", &storage);
-  ProtModule module;
-  Require(module.Init(&host) == 1, "the module binds the services");
+  const BoundModule module(storage);
   RunLines(lines, flags);
-  module.Close();
   return 0;
 }

@@ -21,15 +21,12 @@
 #include <string>
 #include <system_error>
 
-#include "FakeMultiTask.h"
+#include "BoundModule.h"
 #include "HostPermanentStorage.h"
-#include "RecordingHostFactory.h"
 #include "Require.h"
-#include "ScriptedSocketFactory.h"
 #include "StorageError.h"
 #include "StorageFormat.h"
 #include "driver/Protocol_VELT.h"
-#include "factory/ProtModule.h"
 
 namespace {
 
@@ -145,42 +142,32 @@ void CheckGetters(HostPermanentStorage& storage, const StoredSections& sections)
 // with the stored values.
 void CheckChannelStart(HostPermanentStorage& storage, const std::string& section,
                        const StoredSections& sections) {
-  FakeMultiTask tasks;
-  ScriptedSocketFactory sockets;
-  RecordingHostFactory host;
-  host.Offer("IMultiTask2", &tasks);
-  host.Offer("ISocketFactory", &sockets);
-  host.Offer("IPermanentStorage", &storage);
-  ProtModule module;
-  Require(module.Init(&host) == 1, "the module binds the storage");
-  {
-    Protocol_VELT channel;
-    // The identity is a C text, cut at a zero byte; an empty one is the
-    // driver's name.
-    channel.SetIdent(section.c_str());
-    const auto found = sections.find(channel.GetIdent());
-    const StoredEntries entries = found == sections.end() ? StoredEntries() : found->second;
-    Require(channel.Config(kConfig), "the configuration is accepted");
-    channel.Start();
-    const ChannelSettings read = channel.getSettings();
-    Require(read.socketType == TextRead(entries, "socket_type", "UDP") &&
-                read.remoteIp == TextRead(entries, "remote_ip_address", "127.0.0.1") &&
-                read.localIp == TextRead(entries, "local_ip_address", "0.0.0.0") &&
-                read.broadcastType == TextRead(entries, "broadcast_type", "Global") &&
-                read.rxPrefix == TextRead(entries, "rx_prefix", "02") &&
-                read.rxSuffix == TextRead(entries, "rx_suffix", "03") &&
-                read.txPrefix == TextRead(entries, "tx_prefix", "04") &&
-                read.txSuffix == TextRead(entries, "tx_suffix", "05"),
-            "a channel starts with the stored texts, or its configuration's");
-    Require(read.remotePort == NumberRead(entries, "remote_port", 5000) &&
-                read.localPort == NumberRead(entries, "local_port", 6000) &&
-                read.gap == NumberRead(entries, "gap", 7) &&
-                read.tokenQueueSize == NumberRead(entries, "token_queue_size", 9) &&
-                read.hexTokens == FlagRead(entries, "hex_tokens", false),
-            "a channel starts with the stored numbers and flag, or its configuration's");
-    channel.Stop();
-  }
-  module.Close();
+  const BoundModule module(storage);
+  Protocol_VELT channel;
+  // The identity is a C text, cut at a zero byte; an empty one is the
+  // driver's name.
+  channel.SetIdent(section.c_str());
+  const auto found = sections.find(channel.GetIdent());
+  const StoredEntries entries = found == sections.end() ? StoredEntries() : found->second;
+  Require(channel.Config(kConfig), "the configuration is accepted");
+  channel.Start();
+  const ChannelSettings read = channel.getSettings();
+  Require(read.socketType == TextRead(entries, "socket_type", "UDP") &&
+              read.remoteIp == TextRead(entries, "remote_ip_address", "127.0.0.1") &&
+              read.localIp == TextRead(entries, "local_ip_address", "0.0.0.0") &&
+              read.broadcastType == TextRead(entries, "broadcast_type", "Global") &&
+              read.rxPrefix == TextRead(entries, "rx_prefix", "02") &&
+              read.rxSuffix == TextRead(entries, "rx_suffix", "03") &&
+              read.txPrefix == TextRead(entries, "tx_prefix", "04") &&
+              read.txSuffix == TextRead(entries, "tx_suffix", "05"),
+          "a channel starts with the stored texts, or its configuration's");
+  Require(read.remotePort == NumberRead(entries, "remote_port", 5000) &&
+              read.localPort == NumberRead(entries, "local_port", 6000) &&
+              read.gap == NumberRead(entries, "gap", 7) &&
+              read.tokenQueueSize == NumberRead(entries, "token_queue_size", 9) &&
+              read.hexTokens == FlagRead(entries, "hex_tokens", false),
+          "a channel starts with the stored numbers and flag, or its configuration's");
+  channel.Stop();
 }
 
 }  // namespace
