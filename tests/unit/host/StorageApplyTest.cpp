@@ -2,8 +2,12 @@
 // thread holds host mutexes), writes them in one replacement, and reports a
 // write that fails.
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
+#include <linux/fs.h>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <fstream>
 #include <future>
@@ -264,4 +268,57 @@ TEST(HeldHostLocks, ActionsRunInOrderAfterTheLastReleaseOnThatThread) {
   EXPECT_TRUE(HeldHostLocks::Any());
   outer.Unlock();
   EXPECT_FALSE(HeldHostLocks::Any());
+}
+
+namespace {
+
+// Makes a file immutable (chattr +i) for as long as the object lives.
+class Immutable {
+ public:
+  explicit Immutable(const std::string& path) : fd_(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+    int flags = 0;
+    set_ = fd_ >= 0 && ::ioctl(fd_, FS_IOC_GETFLAGS, &flags) == 0 &&
+           ::ioctl(fd_, FS_IOC_SETFLAGS, &(flags |= FS_IMMUTABLE_FL)) == 0;
+  }
+  Immutable(const Immutable&) = delete;
+  Immutable& operator=(const Immutable&) = delete;
+  Immutable(Immutable&&) = delete;
+  Immutable& operator=(Immutable&&) = delete;
+  ~Immutable() {
+    int flags = 0;
+    if (set_ && ::ioctl(fd_, FS_IOC_GETFLAGS, &flags) == 0) {
+      flags &= ~FS_IMMUTABLE_FL;
+      ::ioctl(fd_, FS_IOC_SETFLAGS, &flags);
+    }
+    if (fd_ >= 0) {
+      ::close(fd_);
+    }
+  }
+  bool Set() const { return set_; }
+
+ private:
+  int fd_;
+  bool set_ = false;
+};
+
+}  // namespace
+
+TEST_F(StorageApply, AnImmutableFileIsNotReplaced) {
+  {
+    HostPermanentStorage storage(path);
+    Apply(storage, mutex, 1);
+  }
+  const std::string before = FileText(path);
+  const Immutable immutable(path);
+  if (!immutable.Set()) {
+    GTEST_SKIP() << "cannot make a file immutable here (needs root and a file system that can)";
+  }
+  HostPermanentStorage storage(path);
+  std::vector<StorageFailure> failures;
+  storage.SetFailureHook(
+      [&failures](const StorageFailure& failure) { failures.push_back(failure); });
+  Apply(storage, mutex, 2);
+  ASSERT_EQ(failures.size(), 1U);
+  EXPECT_EQ(failures[0].reason, "cannot write: Operation not permitted");
+  EXPECT_EQ(FileText(path), before);
 }
