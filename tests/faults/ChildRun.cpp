@@ -206,6 +206,19 @@ ChildRun ChildRun::OnTerminal(const std::vector<std::string>& argv, const std::s
   return run;
 }
 
+int ChildRun::Start(const std::vector<std::string>& argv) {
+  std::vector<std::string> words = argv;
+  std::vector<char*> pointers = Pointers(words);
+  posix_spawn_file_actions_t actions;
+  posix_spawn_file_actions_init(&actions);
+  posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, "/dev/null", O_WRONLY, 0);
+  pid_t child = -1;
+  const int spawned =
+      ::posix_spawn(&child, words[0].c_str(), &actions, nullptr, pointers.data(), environ);
+  posix_spawn_file_actions_destroy(&actions);
+  return spawned == 0 ? child : -1;
+}
+
 int ChildRun::Measure(const std::vector<std::string>& argv) {
   std::vector<std::string> words = argv;
   std::vector<char*> pointers = Pointers(words);

@@ -31,6 +31,9 @@ struct ChildRun {
   static ChildRun OnTerminal(const std::vector<std::string>& argv, const std::string& prompt,
                              const std::string& input, std::chrono::milliseconds limit,
                              const std::string& measurer);
+  // Starts argv in the background with its standard output thrown away; the
+  // process id, or -1. The caller ends and reaps it.
+  static int Start(const std::vector<std::string>& argv);
   // The measurer's part: runs argv, then reports its peak memory on standard
   // error. Returns the program's exit status (128 + the signal when killed).
   static int Measure(const std::vector<std::string>& argv);

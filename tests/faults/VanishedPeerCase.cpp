@@ -1,8 +1,6 @@
 #include "VanishedPeerCase.h"
 
-#include <fcntl.h>
 #include <signal.h>
-#include <spawn.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -19,8 +17,6 @@
 
 #include "ChildRun.h"
 #include "PluginChannel.h"
-
-extern char** environ;
 
 namespace {
 
@@ -91,20 +87,11 @@ class VanishingPeer {
     if (!up_) {
       return;
     }
-    std::vector<std::string> words{IpProgram(), "netns",  "exec",     name,     veltPeer,
-                                   "tcp",       "--bind", peerIp,     "--port", kPeerPort,
-                                   "--echo",    "--emit", "forever",  "--rate", "50",
-                                   "--prefix",  "02",     "--suffix", "03",     "--count"};
-    std::vector<char*> argv;
-    for (std::string& word : words) {
-      argv.push_back(word.data());
-    }
-    argv.push_back(nullptr);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, "/dev/null", O_WRONLY, 0);
-    up_ = ::posix_spawn(&pid_, argv[0], &actions, nullptr, argv.data(), environ) == 0;
-    posix_spawn_file_actions_destroy(&actions);
+    pid_ = ChildRun::Start({IpProgram(), "netns",  "exec",     name,     veltPeer,
+                            "tcp",       "--bind", peerIp,     "--port", kPeerPort,
+                            "--echo",    "--emit", "forever",  "--rate", "50",
+                            "--prefix",  "02",     "--suffix", "03",     "--count"});
+    up_ = pid_ > 0;
   }
   VanishingPeer(const VanishingPeer&) = delete;
   VanishingPeer& operator=(const VanishingPeer&) = delete;

@@ -62,10 +62,35 @@ class StorageApply : public ::testing::Test {
     mutex.Unlock();
   }
 
+  // Keeps every failure storage reports in failures.
+  void CollectFailures(HostPermanentStorage& storage) {
+    storage.SetFailureHook([this](const StorageFailure& failure) { failures.push_back(failure); });
+  }
+
+  // Stores apply 1 and gives the file's text.
+  std::string StoreFirstApply() {
+    HostPermanentStorage storage(path);
+    Apply(storage, mutex, 1);
+    return FileText(path);
+  }
+
+  // Apply 2 over a file made unwritable must fail for reason and leave the
+  // file as it was.
+  void ExpectApplyRefused(const std::string& before, const std::string& reason) {
+    HostPermanentStorage storage(path);
+    CollectFailures(storage);
+    Apply(storage, mutex, 2);
+    ASSERT_EQ(failures.size(), 1U);
+    EXPECT_EQ(failures[0].reason, reason);
+    EXPECT_EQ(FileText(path), before);
+    EXPECT_EQ(DurableFile::SweepTemporaries(path), 0);
+  }
+
   TempDirectory dir;
   std::string path;
   CountingWriter counter;
   HostMutex mutex;
+  std::vector<StorageFailure> failures;
 };
 
 }  // namespace
@@ -159,9 +184,7 @@ TEST_F(StorageApply, AThreadsReleaseWritesOnlyTheValuesItSet) {
 TEST_F(StorageApply, AFailedWriteIsReportedOnceAndItsValuesHoldAndAreWrittenLater) {
   HostPermanentStorage storage(path, counter.Writer());
   Apply(storage, mutex, 1);
-  std::vector<StorageFailure> failures;
-  storage.SetFailureHook(
-      [&failures](const StorageFailure& failure) { failures.push_back(failure); });
+  CollectFailures(storage);
   counter.failing = true;
   Apply(storage, mutex, 2);
   ASSERT_EQ(failures.size(), 1U);
@@ -191,34 +214,20 @@ TEST_F(StorageApply, AFailedWriteIsReportedOnceAndItsValuesHoldAndAreWrittenLate
 
 TEST_F(StorageApply, AFailedSingleValueIsReportedInTheSingular) {
   HostPermanentStorage storage(path, counter.Writer());
-  std::vector<std::string> texts;
-  storage.SetFailureHook(
-      [&texts](const StorageFailure& failure) { texts.push_back(failure.Text()); });
+  CollectFailures(storage);
   counter.failing = true;
   counter.failure = "cannot flush: Input/output error";
   storage.SetIntValue("VELT", "gap", 4);
-  EXPECT_EQ(texts, std::vector<std::string>{
-                       "the storage file " + path +
-                       " was not updated (cannot flush: Input/output error); the value just "
-                       "applied holds until restart"});
+  ASSERT_EQ(failures.size(), 1U);
+  EXPECT_EQ(failures[0].Text(), "the storage file " + path +
+                                    " was not updated (cannot flush: Input/output error); the "
+                                    "value just applied holds until restart");
 }
 
 TEST_F(StorageApply, AReadOnlyFileIsNotReplaced) {
-  {
-    HostPermanentStorage storage(path);
-    Apply(storage, mutex, 1);
-  }
-  const std::string before = FileText(path);
+  const std::string before = StoreFirstApply();
   ASSERT_EQ(::chmod(path.c_str(), 0444), 0);
-  HostPermanentStorage storage(path);
-  std::vector<StorageFailure> failures;
-  storage.SetFailureHook(
-      [&failures](const StorageFailure& failure) { failures.push_back(failure); });
-  Apply(storage, mutex, 2);
-  ASSERT_EQ(failures.size(), 1U);
-  EXPECT_EQ(failures[0].reason, "cannot write: Permission denied");
-  EXPECT_EQ(FileText(path), before);
-  EXPECT_EQ(DurableFile::SweepTemporaries(path), 0);
+  ExpectApplyRefused(before, "cannot write: Permission denied");
 }
 
 TEST_F(StorageApply, ValuesOfAHoldNotReleasedAreWrittenWhenTheStorageGoes) {
@@ -234,9 +243,7 @@ TEST_F(StorageApply, ValuesOfAHoldNotReleasedAreWrittenWhenTheStorageGoes) {
 
 TEST_F(StorageApply, AFileThatWouldPassTheLimitIsNotWritten) {
   HostPermanentStorage storage(path, counter.Writer());
-  std::vector<StorageFailure> failures;
-  storage.SetFailureHook(
-      [&failures](const StorageFailure& failure) { failures.push_back(failure); });
+  CollectFailures(storage);
   const std::string large(HostPermanentStorage::kLargestFile, 'x');
   storage.SetStringValue("VELT", "rx_prefix", large.c_str());
   EXPECT_EQ(counter.writes, 0);
@@ -304,21 +311,10 @@ class Immutable {
 }  // namespace
 
 TEST_F(StorageApply, AnImmutableFileIsNotReplaced) {
-  {
-    HostPermanentStorage storage(path);
-    Apply(storage, mutex, 1);
-  }
-  const std::string before = FileText(path);
+  const std::string before = StoreFirstApply();
   const Immutable immutable(path);
   if (!immutable.Set()) {
     GTEST_SKIP() << "cannot make a file immutable here (needs root and a file system that can)";
   }
-  HostPermanentStorage storage(path);
-  std::vector<StorageFailure> failures;
-  storage.SetFailureHook(
-      [&failures](const StorageFailure& failure) { failures.push_back(failure); });
-  Apply(storage, mutex, 2);
-  ASSERT_EQ(failures.size(), 1U);
-  EXPECT_EQ(failures[0].reason, "cannot write: Operation not permitted");
-  EXPECT_EQ(FileText(path), before);
+  ExpectApplyRefused(before, "cannot write: Operation not permitted");
 }
