@@ -7,6 +7,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <fstream>
 #include <iterator>
@@ -80,7 +81,9 @@ void FullDisk(FaultCase& fault, const FaultPrograms& programs) {
     return;
   }
   fault.Figure("velt-host said: " + run.err.substr(0, run.err.find('\n')));
-  fault.Figure("gap read back after the failed apply, exit status and file: " + run.out);
+  std::string said = run.out;
+  std::replace(said.begin(), said.end(), '\n', ' ');
+  fault.Figure("read back after the failed apply: gap " + said);
   fault.Expect(run.err == "velt-host: the storage file " + path +
                               " was not updated (cannot write: No space left on device); the "
                               "value just applied holds until restart\n",
