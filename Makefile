@@ -6,6 +6,8 @@
 #   make bench  builds the default preset and runs the benchmarks (short runs)
 #   make fuzz   builds the fuzz preset and runs each fuzz target for
 #               FUZZ_SECONDS (default 20) from its seed corpus
+#   make faults builds the default preset and runs the fault suite
+#               (docs/reliability.md; FAULTS="case ..." picks cases)
 #   make format applies clang-format; make format-check only checks
 #   make tidy   runs clang-tidy on the default build and fails on any finding
 
@@ -16,7 +18,7 @@ export CMAKE_GENERATOR ?= $(if $(shell command -v ninja 2>/dev/null),Ninja,Unix 
 FORMAT_DIRS := src hostapi tests host tools bench fuzz examples
 FORMAT_FILES = $(shell find $(FORMAT_DIRS) -name '*.h' -o -name '*.cpp' 2>/dev/null | sort)
 
-.PHONY: test deps build demo run-demo bench fuzz format format-check tidy clean \
+.PHONY: test deps build demo run-demo bench fuzz faults format format-check tidy clean \
 	$(addprefix suite-,default asan tsan clang)
 
 test: deps format-check suite-default run-demo suite-asan suite-tsan
@@ -56,6 +58,10 @@ fuzz: deps
 	cmake --preset fuzz
 	cmake --build --preset fuzz -j $(JOBS)
 	sh scripts/fuzz.sh build/fuzz $(FUZZ_SECONDS)
+
+# Slow and partly privileged (mounts, network namespaces), so not in make test.
+faults: build
+	build/default/tests/faults/fault_suite $(FAULTS)
 
 format-check:
 	@clang-format --dry-run --Werror $(FORMAT_FILES)

@@ -1,5 +1,13 @@
 #include "HostMutex.h"
 
-void HostMutex::Lock() { mutex_.lock(); }
+#include "HeldHostLocks.h"
 
-void HostMutex::Unlock() { mutex_.unlock(); }
+void HostMutex::Lock() {
+  mutex_.lock();
+  HeldHostLocks::Entered();
+}
+
+void HostMutex::Unlock() {
+  mutex_.unlock();
+  HeldHostLocks::Left();
+}

@@ -6,7 +6,9 @@
 
 // A plain, non-recursive mutex handed to the plug-in. Locking it twice on one
 // thread, or unlocking it on a thread that does not hold it, is a caller
-// error, as for any plain mutex.
+// error, as for any plain mutex. Each lock and unlock is counted for the
+// calling thread (HeldHostLocks), so that the permanent storage can write
+// the values set under one hold together.
 class HostMutex final : public IMutex {
  public:
   HostMutex() = default;

@@ -1,10 +1,10 @@
 #include "HostPermanentStorage.h"
 
 #include <cstring>
-#include <optional>
 #include <utility>
 
 #include "DurableFile.h"
+#include "HeldHostLocks.h"
 #include "StorageError.h"
 #include "StorageFormat.h"
 
@@ -24,7 +24,7 @@ bool Same(const char* name, const char* expected) {
 StoredSections Load(const std::string& path) {
   std::string contents;
   std::string error;
-  switch (DurableFile::Read(path, contents, error)) {
+  switch (DurableFile::Read(path, HostPermanentStorage::kLargestFile, contents, error)) {
     case DurableFile::ReadResult::Missing:
       return {};
     case DurableFile::ReadResult::Failed:
@@ -35,10 +35,63 @@ StoredSections Load(const std::string& path) {
   return StorageFormat::Parse(contents, path);
 }
 
+// Sets every value of group in into; returns how many were new or
+// different.
+int Merge(StoredSections& into, const StoredSections& group) {
+  int changed = 0;
+  for (const auto& [section, entries] : group) {
+    StoredEntries& target = into[section];
+    for (const auto& [name, value] : entries) {
+      const auto [slot, added] = target.try_emplace(name, value);
+      if (!added && slot->second != value) {
+        slot->second = value;
+        ++changed;
+      }
+      changed += added ? 1 : 0;
+    }
+  }
+  return changed;
+}
+
+int CountValues(const StoredSections& group) {
+  int count = 0;
+  for (const auto& entries : group) {
+    count += static_cast<int>(entries.second.size());
+  }
+  return count;
+}
+
 }  // namespace
 
-HostPermanentStorage::HostPermanentStorage(std::string path)
-    : path_(std::move(path)), sections_(Load(path_)) {}
+HostPermanentStorage::HostPermanentStorage(std::string path, FileWriter writer)
+    : path_(std::move(path)),
+      writer_(std::move(writer)),
+      swept_(DurableFile::SweepTemporaries(path_)),
+      sections_(Load(path_)),
+      saved_(sections_),
+      owner_(std::make_shared<Owner>()) {
+  owner_->storage = this;
+}
+
+HostPermanentStorage::~HostPermanentStorage() {
+  {
+    const std::lock_guard<std::mutex> detach(owner_->mutex);
+    owner_->storage = nullptr;
+  }
+  std::unique_lock<std::mutex> lock(mutex_);
+  StoredSections unfinished;
+  for (const auto& entry : open_) {
+    Merge(unfinished, entry.second);
+  }
+  open_.clear();
+  if (!unfinished.empty()) {
+    Save(lock, unfinished);
+  }
+}
+
+HostPermanentStorage::FileWriter HostPermanentStorage::DefaultWriter() {
+  return &DurableFile::Replace;
+}
 
 IInterface* HostPermanentStorage::ConvertTo(const char* name) {
   if (Same(name, "IPermanentStorage") || Same(name, "IPermanentStorage2")) {
@@ -108,35 +161,69 @@ std::string HostPermanentStorage::LastError() const {
   return lastError_;
 }
 
+void HostPermanentStorage::SetFailureHook(FailureHook hook) {
+  const std::lock_guard<std::mutex> lock(mutex_);
+  hook_ = std::move(hook);
+}
+
 void HostPermanentStorage::Store(const char* section, const char* name, const StoredValue& value) {
   if (section == nullptr || name == nullptr) {
     return;
   }
-  const std::lock_guard<std::mutex> lock(mutex_);
-  StoredEntries& entries = sections_[section];
-  const auto existing = entries.find(name);
-  std::optional<StoredValue> previous;
-  if (existing != entries.end()) {
-    if (existing->second == value) {
-      return;  // already on the disk
-    }
-    previous = existing->second;
-  }
-  entries[name] = value;
-  std::string error;
-  const bool replaced = DurableFile::Replace(path_, StorageFormat::Serialize(sections_), error);
-  lastError_ = error;
-  if (replaced) {
+  std::unique_lock<std::mutex> lock(mutex_);
+  sections_[section][name] = value;
+  if (!HeldHostLocks::Any()) {
+    StoredSections single;
+    single[section][name] = value;
+    Save(lock, single);
     return;
   }
-  // Not on the disk, so not stored: memory keeps matching the file.
-  if (previous.has_value()) {
-    entries[name] = *previous;
+  const auto [group, opened] = open_.try_emplace(std::this_thread::get_id());
+  group->second[section][name] = value;
+  if (opened) {
+    HeldHostLocks::AtLastUnlock([owner = owner_] {
+      const std::lock_guard<std::mutex> alive(owner->mutex);
+      if (owner->storage != nullptr) {
+        owner->storage->FinishGroup();
+      }
+    });
+  }
+}
+
+void HostPermanentStorage::FinishGroup() {
+  std::unique_lock<std::mutex> lock(mutex_);
+  const auto group = open_.find(std::this_thread::get_id());
+  if (group == open_.end()) {
+    return;
+  }
+  const StoredSections values = std::move(group->second);
+  open_.erase(group);
+  Save(lock, values);
+}
+
+void HostPermanentStorage::Save(std::unique_lock<std::mutex>& lock, const StoredSections& group) {
+  if (Merge(saved_, group) == 0 && fileCurrent_) {
+    return;  // already in the file
+  }
+  const std::string contents = StorageFormat::Serialize(saved_);
+  std::string error;
+  bool written = false;
+  if (contents.size() > kLargestFile) {
+    error =
+        "cannot write: the file would be larger than " + std::to_string(kLargestFile) + " bytes";
   } else {
-    entries.erase(name);
-    if (entries.empty()) {
-      sections_.erase(section);
-    }
+    written = writer_(path_, contents, error);
+  }
+  lastError_ = error;
+  fileCurrent_ = written;
+  if (written) {
+    return;
+  }
+  const StorageFailure failure{path_, error, CountValues(group)};
+  const FailureHook hook = hook_;
+  lock.unlock();
+  if (hook) {
+    hook(failure);
   }
 }
 

@@ -14,6 +14,10 @@ namespace {
 
 constexpr int kDatagrams = 1500;
 constexpr int kSends = 300;
+// Frames sent and not yet collected, at most: a peer socket's receive
+// buffer (about 200 KiB by default, 1 KiB or more per datagram) holds them
+// however late the collector runs, so the kernel never drops one.
+constexpr int kFramesInFlight = 64;
 
 // A worker receiving a stream of datagrams while one host thread reads and
 // acknowledges tokens and another sends tokens, stages and applies runtime
@@ -45,6 +49,7 @@ TEST_F(ChannelStress, WorkerReadersWritersAndAppliesRunTogether) {
   std::atomic<bool> sending{true};
   std::atomic<int> read{0};
   std::atomic<int> sent{0};
+  std::atomic<int> collected{0};
   // The frames the writer sends, collected while the run goes on so the
   // peer's receive buffer never overflows.
   std::vector<LoopbackIo::Bytes> frames;
@@ -55,6 +60,7 @@ TEST_F(ChannelStress, WorkerReadersWritersAndAppliesRunTogether) {
       LoopbackIo::Bytes frame = LoopbackIo::ReceiveDatagram(peer.Get(), 100ms, nullptr);
       if (!frame.empty()) {
         frames.push_back(std::move(frame));
+        ++collected;
       }
     }
   });
@@ -87,6 +93,11 @@ TEST_F(ChannelStress, WorkerReadersWritersAndAppliesRunTogether) {
   });
   std::thread writer([&] {
     for (int i = 0; i < kSends; ++i) {
+      const auto deadline = std::chrono::steady_clock::now() + 5s;
+      while (i - collected.load() >= kFramesInFlight &&
+             std::chrono::steady_clock::now() < deadline) {
+        std::this_thread::sleep_for(100us);
+      }
       unsigned char text[33] = {};
       const std::string payload = "out " + std::to_string(i);
       std::memcpy(text, payload.data(), payload.size());

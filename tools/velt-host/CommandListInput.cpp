@@ -8,12 +8,16 @@ CommandListInput::CommandListInput(std::vector<std::string> commands, StopSignal
                                    std::unique_ptr<LineInput> standardInput)
     : commands_(std::move(commands)), signals_(signals), standardInput_(std::move(standardInput)) {}
 
-bool CommandListInput::Next(std::string& line) {
+LineInput::Read CommandListInput::Next(std::string& line) {
   if (signals_.Raised() || next_ == commands_.size()) {
-    return false;
+    return Read::kEnded;
   }
-  line = commands_[next_++];
-  return true;
+  const std::string& command = commands_[next_++];
+  if (command.size() > kLongestLine) {
+    return Read::kTooLong;
+  }
+  line = command;
+  return Read::kLine;
 }
 
 }  // namespace velthost

@@ -17,7 +17,7 @@ class CommandListInput final : public LineInput {
   CommandListInput(std::vector<std::string> commands, StopSignals& signals,
                    std::unique_ptr<LineInput> standardInput);
 
-  bool Next(std::string& line) override;
+  Read Next(std::string& line) override;
   std::unique_ptr<WatchEnd> BeginWatch() override { return standardInput_->BeginWatch(); }
   bool KeyEndsWatch() const override { return standardInput_->KeyEndsWatch(); }
 

@@ -64,8 +64,18 @@ Console::Console(const std::vector<std::unique_ptr<Instance>>& instances, Consol
 
 void Console::RunAll() {
   std::string line;
-  while (!quit_ && input_.Next(line)) {
-    Run(line);
+  while (!quit_) {
+    switch (input_.Next(line)) {
+      case LineInput::Read::kEnded:
+        return;
+      case LineInput::Read::kTooLong:
+        Fail("a line longer than " + std::to_string(LineInput::kLongestLine) +
+             " bytes was refused");
+        break;
+      case LineInput::Read::kLine:
+        Run(line);
+        break;
+    }
   }
 }
 
@@ -91,6 +101,10 @@ bool Console::NeedInstance() { return current_ != nullptr || Fail("no instance")
 bool Console::RunDriverCommand(const std::string& line) {
   if (!NeedInstance()) {
     return false;
+  }
+  std::string error;
+  if (!current_->CommandFits(line, error)) {
+    return Fail(error);
   }
   std::string reply;
   const bool ok = current_->Command(line, reply);

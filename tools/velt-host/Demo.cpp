@@ -218,8 +218,10 @@ bool Demo::StageAndApply(PluginSession& session, Instance& instance) {
   if (!Step(".write ?SP_Done?boolean 1") || !Step(std::string(".read ") + kGap)) {
     return false;
   }
+  // Read from the file itself, not from the values in force.
   HostPermanentStorage* const storage = session.Host().Storage();
-  if (storage == nullptr || storage->GetIntValue("VELT", "gap") != kStagedGap) {
+  if (storage == nullptr ||
+      HostPermanentStorage(storage->Path()).GetIntValue("VELT", "gap") != kStagedGap) {
     return Fail("the applied gap did not reach the storage file");
   }
   Say("the storage file now holds gap = " + gap + " in the section VELT");

@@ -14,7 +14,7 @@ class DemoInput final : public LineInput {
  public:
   explicit DemoInput(StopSignals& signals) : signals_(signals) {}
 
-  bool Next(std::string& /*line*/) override { return false; }
+  Read Next(std::string& /*line*/) override { return Read::kEnded; }
   std::unique_ptr<WatchEnd> BeginWatch() override;
   bool KeyEndsWatch() const override { return false; }
 

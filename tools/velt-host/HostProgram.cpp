@@ -2,6 +2,7 @@
 
 #include <unistd.h>
 
+#include <atomic>
 #include <clocale>
 #include <csignal>
 #include <cstdlib>
@@ -19,6 +20,7 @@
 #include "velt-host/HostCommandLine.h"
 #include "velt-host/PluginSession.h"
 #include "velt-host/ProtocolHandle.h"
+#include "velt-host/StoredSettings.h"
 #include "velt-host/StreamInput.h"
 #include "velt-host/TerminalInput.h"
 
@@ -154,6 +156,14 @@ int HostProgram::PrintInfo(const std::string& pluginPath, ConsoleOutput& output)
   return kSucceeded;
 }
 
+HostSocket::Timeouts HostProgram::SocketTimeouts(const HostOptions& options) {
+  HostSocket::Timeouts timeouts;
+  if (options.connectBackoff.has_value()) {
+    timeouts.connectBackoff = *options.connectBackoff;
+  }
+  return timeouts;
+}
+
 int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
                             ConsoleOutput& output) {
   const bool terminal = ::isatty(STDIN_FILENO) == 1;
@@ -176,15 +186,37 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
     throw std::runtime_error("cannot run " + std::to_string(configs.size()) +
                              " instances: " + limitError);
   }
-  HostSocket::Timeouts timeouts;
-  if (options.connectBackoff.has_value()) {
-    timeouts.connectBackoff = *options.connectBackoff;
+  // Storage failures are reported on the thread that applied: the console's.
+  std::atomic<bool> storageFailed{false};
+  bool commandFailed = false;
+  {
+    PluginSession session(pluginPath, storagePath, SocketTimeouts(options),
+                          [&output, &storageFailed](const StorageFailure& failure) {
+                            output.Error(failure.Text());
+                            storageFailed = true;
+                          });
+    WarnOfStoredSettings(session, options, configs.size(), output);
+    for (std::size_t i = 0; i < configs.size(); ++i) {
+      session.AddInstance(options.names[i], configs[i]);
+    }
+    commandFailed = RunCommands(options, signals, output, session, terminal);
   }
-  PluginSession session(pluginPath, storagePath, timeouts);
-  for (std::size_t i = 0; i < configs.size(); ++i) {
-    session.AddInstance(options.names[i], configs[i]);
-  }
+  return commandFailed || storageFailed ? kFailed : kSucceeded;
+}
 
+void HostProgram::WarnOfStoredSettings(PluginSession& session, const HostOptions& options,
+                                       std::size_t instances, ConsoleOutput& output) {
+  HostPermanentStorage* const storage = session.Host().Storage();
+  for (std::size_t i = 0; storage != nullptr && i < instances; ++i) {
+    for (const std::string& warning : StoredSettings::Warnings(*storage, options.names[i])) {
+      output.Error("warning: " + warning);
+    }
+  }
+}
+
+// True when a command failed.
+bool HostProgram::RunCommands(const HostOptions& options, StopSignals& signals,
+                              ConsoleOutput& output, PluginSession& session, bool terminal) {
   const Console* console = nullptr;
   const auto prompt = [&console]() {
     return console == nullptr ? std::string() : console->Prompt();
@@ -205,14 +237,15 @@ int HostProgram::RunConsole(const HostOptions& options, StopSignals& signals,
   Console running(session.Instances(), output, *input);
   console = &running;
   if (terminal && options.commands.empty()) {
-    output.Message(HostCommandLine::Version() + ": plug-in " + pluginPath + ", storage " +
-                   storagePath);
+    const HostPermanentStorage* const storage = session.Host().Storage();
+    output.Message(HostCommandLine::Version() + ": plug-in " + PluginPath(options) + ", storage " +
+                   (storage == nullptr ? std::string("none") : storage->Path()));
     output.Message(session.Instances().empty() ? "no instance (--config creates one)"
                                                : "instances: " + Join(session.Instances()));
     output.Message(".help lists the host's commands, help the instance's; .quit or Ctrl-D leaves");
   }
   running.RunAll();
-  return running.Failed() ? kFailed : kSucceeded;
+  return running.Failed();
 }
 
 }  // namespace velthost

@@ -7,8 +7,11 @@
 #include "velt-host/ConsoleOutput.h"
 #include "velt-host/HostOptions.h"
 #include "velt-host/StopSignals.h"
+#include "HostSocket.h"
 
 namespace velthost {
+
+class PluginSession;
 
 // velt-host from its command line to its exit status: 0 when every command
 // succeeded, 1 when one failed or start-up failed, 2 for a bad command line.
@@ -25,11 +28,16 @@ class HostProgram {
  private:
   static int RunAction(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
   static int RunConsole(const HostOptions& options, StopSignals& signals, ConsoleOutput& output);
+  static void WarnOfStoredSettings(PluginSession& session, const HostOptions& options,
+                                   std::size_t instances, ConsoleOutput& output);
+  static bool RunCommands(const HostOptions& options, StopSignals& signals, ConsoleOutput& output,
+                          PluginSession& session, bool terminal);
   static int PrintXml(const std::string& pluginPath, ConsoleOutput& output);
   static int PrintInfo(const std::string& pluginPath, ConsoleOutput& output);
   static std::string PluginPath(const HostOptions& options);
   static std::string StoragePath(const HostOptions& options);
   static std::vector<std::string> ConfigStrings(const HostOptions& options);
+  static HostSocket::Timeouts SocketTimeouts(const HostOptions& options);
 
   std::FILE* out_;
   std::FILE* err_;

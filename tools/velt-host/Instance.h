@@ -16,6 +16,10 @@ class Instance {
  public:
   // The reply buffer of one console command.
   static constexpr int kReplyBytes = 64 * 1024;
+  // The longest tag value, in bytes, that velt-host reads or writes, or lets
+  // the instance's console read or write: buffers as long as the tag are
+  // allocated for it.
+  static constexpr int kLongestValue = 16 * 1024 * 1024;
 
   // Throws std::runtime_error naming what failed ("cannot configure NAME: "
   // and the protocol's last error, for instance).
@@ -33,6 +37,10 @@ class Instance {
   // to its terminator, or the whole buffer when it fills it). Returns the
   // command's result.
   bool Command(const std::string& line, std::string& reply);
+  // False with error set when line is a read or write command of the
+  // instance's console (its words taken as that console takes them) whose
+  // tag's value is longer than kLongestValue; such a line must not be run.
+  bool CommandFits(const std::string& line, std::string& error);
   // Reads the tag at uri into value (the tag's length in bytes) and tells
   // its shape; false with error set when the address is refused or the read
   // fails.
@@ -45,6 +53,9 @@ class Instance {
 
  private:
   std::string LastError() const;
+  // False with error set when the tag's value is longer than kLongestValue.
+  static bool Fits(const ValueShape& shape, const std::string& verb, const std::string& uri,
+                   std::string& error);
 
   std::string name_;
   ProtocolHandle handle_;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <memory>
 #include <string>
 
@@ -11,10 +12,19 @@ namespace velthost {
 // scripted standard input, or the -c commands.
 class LineInput {
  public:
+  // The longest command line taken, in bytes, without its line ending.
+  static constexpr std::size_t kLongestLine = std::size_t{1024} * 1024;
+
+  enum class Read {
+    kLine,     // a line
+    kTooLong,  // a line longer than kLongestLine, dropped whole
+    kEnded,    // the end of the input, or a stop signal
+  };
+
   virtual ~LineInput() = default;
-  // The next line without its line feed; false at the end of the input or
-  // once a stop signal has arrived.
-  virtual bool Next(std::string& line) = 0;
+  // The next line without its line feed. A line longer than kLongestLine is
+  // never kept in full: it is read to its end and dropped.
+  virtual Read Next(std::string& line) = 0;
   // What ends a .watch that runs while this input is in use.
   virtual std::unique_ptr<WatchEnd> BeginWatch() = 0;
   // True when a .watch is ended by a key press (standard input is a

@@ -1,17 +1,22 @@
 #include "velt-host/PluginSession.h"
 
 #include <stdexcept>
+#include <utility>
 
 #include "StorageError.h"
 
 namespace velthost {
 
 PluginSession::PluginSession(const std::string& pluginPath, const std::string& storagePath,
-                             HostSocket::Timeouts socketTimeouts) {
+                             HostSocket::Timeouts socketTimeouts,
+                             HostPermanentStorage::FailureHook onStorageFailure) {
   try {
     host_ = std::make_unique<HostInterfaceFactory>(storagePath, socketTimeouts);
   } catch (const StorageError& e) {
     throw std::runtime_error(std::string("cannot read the storage file ") + e.what());
+  }
+  if (host_->Storage() != nullptr) {
+    host_->Storage()->SetFailureHook(std::move(onStorageFailure));
   }
   plugin_ = std::make_unique<PluginLoader>(pluginPath, *host_);
 }

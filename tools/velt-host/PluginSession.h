@@ -18,9 +18,12 @@ class PluginSession {
  public:
   // Throws std::runtime_error naming what failed: the storage file, the
   // loader's text, or the module's. An empty storage path gives a host
-  // without permanent storage.
+  // without permanent storage. onStorageFailure is told of every write of
+  // the storage file that fails, from before the plug-in is loaded until
+  // the session is gone.
   PluginSession(const std::string& pluginPath, const std::string& storagePath,
-                HostSocket::Timeouts socketTimeouts = HostSocket::Timeouts());
+                HostSocket::Timeouts socketTimeouts = HostSocket::Timeouts(),
+                HostPermanentStorage::FailureHook onStorageFailure = {});
   PluginSession(const PluginSession&) = delete;
   PluginSession& operator=(const PluginSession&) = delete;
   PluginSession(PluginSession&&) = delete;

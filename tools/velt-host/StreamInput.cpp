@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cerrno>
+#include <utility>
 
 namespace velthost {
 
@@ -12,15 +13,18 @@ namespace {
 constexpr std::size_t kReadBytes = 16384;
 
 // Ends a .watch at the end of the stream; input that arrives meanwhile is
-// kept for the lines after the watch.
+// kept for the lines after the watch, as much as the input holds.
 class StreamWatchEnd final : public WatchEnd {
  public:
   StreamWatchEnd(StreamInput& input, StopSignals& signals) : input_(input), signals_(signals) {}
 
   Event Wait(std::chrono::milliseconds timeout) override {
-    if (input_.Ended()) {
-      return signals_.Wait(-1, timeout) == StopSignals::Event::kSignal ? Event::kSignal
-                                                                       : Event::kInputEnded;
+    if (input_.Ended() || input_.Full()) {
+      // Nothing more is read while a full buffer waits for the console.
+      if (signals_.Wait(-1, timeout) == StopSignals::Event::kSignal) {
+        return Event::kSignal;
+      }
+      return input_.Ended() ? Event::kInputEnded : Event::kNone;
     }
     const StopSignals::Event event = input_.Fill(timeout);
     if (event == StopSignals::Event::kSignal) {
@@ -51,23 +55,32 @@ StopSignals::Event StreamInput::Fill(std::chrono::milliseconds timeout) {
   return event;
 }
 
-bool StreamInput::Next(std::string& line) {
+LineInput::Read StreamInput::Next(std::string& line) {
   for (;;) {
     if (signals_.Raised()) {
-      return false;
+      return Read::kEnded;
     }
-    const std::size_t newline = pending_.find('\n');
+    const std::size_t newline = pending_.find('\n', scanned_);
     if (newline != std::string::npos) {
       line.assign(pending_, 0, newline);
       pending_.erase(0, newline + 1);
+      scanned_ = 0;
       break;
     }
+    scanned_ = pending_.size();
+    if (Full()) {
+      // Longer than any line taken, even with a carriage return.
+      dropping_ = true;
+      pending_.clear();
+      scanned_ = 0;
+    }
     if (ended_) {
-      if (pending_.empty()) {
-        return false;
+      if (pending_.empty() && !dropping_) {
+        return Read::kEnded;
       }
       line.swap(pending_);
       pending_.clear();
+      scanned_ = 0;
       break;
     }
     Fill(std::chrono::milliseconds(-1));
@@ -75,7 +88,11 @@ bool StreamInput::Next(std::string& line) {
   if (!line.empty() && line.back() == '\r') {
     line.pop_back();
   }
-  return true;
+  if (std::exchange(dropping_, false) || line.size() > kLongestLine) {
+    line.clear();
+    return Read::kTooLong;
+  }
+  return Read::kLine;
 }
 
 std::unique_ptr<WatchEnd> StreamInput::BeginWatch() {

@@ -55,6 +55,9 @@ int TerminalInput::ReadCharacter(editline* editor, wchar_t* character) {
       }
       return -1;
     }
+    if (self->TooLong(byte)) {
+      continue;
+    }
     // A false positive: mbrtowc shares hidden state between threads only
     // when it is given none of its own; each editor passes its own decoder_.
     // NOLINTNEXTLINE(concurrency-mt-unsafe)
@@ -69,6 +72,22 @@ int TerminalInput::ReadCharacter(editline* editor, wchar_t* character) {
     }
     return 1;
   }
+}
+
+// Counts the bytes of the line being typed. Past kLongestLine they are
+// dropped up to the end of the line, which then reaches the editor so that
+// it gives the line up; Next refuses it.
+bool TerminalInput::TooLong(char& byte) {
+  const bool end = byte == '\n' || byte == '\r';
+  if (dropping_) {
+    byte = '\n';
+    return !end;
+  }
+  if (!end && ++lineBytes_ > kLongestLine) {
+    dropping_ = true;
+    return true;
+  }
+  return false;
 }
 
 bool TerminalInput::OpenEditor() {
@@ -91,13 +110,15 @@ bool TerminalInput::OpenEditor() {
   return true;
 }
 
-bool TerminalInput::Next(std::string& line) {
+LineInput::Read TerminalInput::Next(std::string& line) {
   if (signals_.Raised()) {
-    return false;
+    return Read::kEnded;
   }
   if (editor_ == nullptr && !OpenEditor()) {
-    return false;
+    return Read::kEnded;
   }
+  lineBytes_ = 0;
+  dropping_ = false;
   int count = 0;
   const char* text = nullptr;
   {
@@ -112,7 +133,10 @@ bool TerminalInput::Next(std::string& line) {
     // terminal that no longer takes output has no one left to tell.
     (void)std::fputs("\n", stdout);
     (void)std::fflush(stdout);
-    return false;
+    return Read::kEnded;
+  }
+  if (dropping_) {
+    return Read::kTooLong;
   }
   line.assign(text, static_cast<std::size_t>(count));
   if (!line.empty() && line.back() == '\n') {
@@ -122,7 +146,7 @@ bool TerminalInput::Next(std::string& line) {
     HistEvent event{};
     history(history_.get(), &event, H_ENTER, line.c_str());
   }
-  return true;
+  return Read::kLine;
 }
 
 std::unique_ptr<WatchEnd> TerminalInput::BeginWatch() {

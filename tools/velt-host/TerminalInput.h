@@ -32,7 +32,7 @@ class TerminalInput final : public LineInput {
   TerminalInput& operator=(TerminalInput&&) = delete;
   ~TerminalInput() override;
 
-  bool Next(std::string& line) override;
+  Read Next(std::string& line) override;
   std::unique_ptr<WatchEnd> BeginWatch() override;
   bool KeyEndsWatch() const override { return true; }
 
@@ -48,11 +48,15 @@ class TerminalInput final : public LineInput {
   static char* Prompt(editline* editor);
   static int ReadCharacter(editline* editor, wchar_t* character);
   static TerminalInput* Owner(editline* editor);
+  bool TooLong(char& byte);
 
   StopSignals& signals_;
   std::function<std::string()> prompt_;
   std::string promptText_;
   std::mbstate_t decoder_{};
+  // Bytes typed on the current line, and whether it is being dropped.
+  std::size_t lineBytes_ = 0;
+  bool dropping_ = false;
   std::unique_ptr<history, HistoryCloser> history_;
   std::unique_ptr<editline, EditorCloser> editor_;
 };

@@ -381,7 +381,7 @@ bool TypedValue::Parse(const ValueShape& shape, const std::string& text,
   bool ok = false;
   if (shape.type == ICU_STRING) {
     ok = text.size() <= static_cast<std::size_t>(length);
-    if (ok) {
+    if (ok && !text.empty()) {
       std::memcpy(bytes.data(), text.data(), text.size());
     }
     expected = "at most " + std::to_string(length) + " bytes expected";

@@ -100,7 +100,7 @@ TEST(DurableWrite, ReplaceSwapsTheWholeFileAndLeavesNoTemporaryFile) {
   ASSERT_TRUE(DurableFile::Replace(path, "second", error)) << error;
   EXPECT_EQ(error, "");
   std::string contents;
-  EXPECT_EQ(DurableFile::Read(path, contents, error), DurableFile::ReadResult::Read);
+  EXPECT_EQ(DurableFile::Read(path, 100, contents, error), DurableFile::ReadResult::Read);
   EXPECT_EQ(contents, "second");
   int entries = 0;
   for (const auto& entry : std::filesystem::directory_iterator(dir.Path())) {
@@ -128,8 +128,8 @@ TEST(DurableWrite, ReadTellsAMissingFileFromAnUnreadableOne) {
   TempDirectory dir;
   std::string contents = "unchanged";
   std::string error;
-  EXPECT_EQ(DurableFile::Read(dir.File("absent"), contents, error),
+  EXPECT_EQ(DurableFile::Read(dir.File("absent"), 100, contents, error),
             DurableFile::ReadResult::Missing);
-  EXPECT_EQ(DurableFile::Read(dir.Path(), contents, error), DurableFile::ReadResult::Failed);
-  EXPECT_EQ(error, "cannot read: Is a directory");
+  EXPECT_EQ(DurableFile::Read(dir.Path(), 100, contents, error), DurableFile::ReadResult::Failed);
+  EXPECT_EQ(error, "cannot read: not a regular file but a folder");
 }

@@ -30,12 +30,16 @@ const std::string kConfig =
 class ScriptInput final : public LineInput {
  public:
   explicit ScriptInput(std::vector<std::string> lines) : lines_(std::move(lines)) {}
-  bool Next(std::string& line) override {
+  Read Next(std::string& line) override {
     if (next_ == lines_.size()) {
-      return false;
+      return Read::kEnded;
+    }
+    if (lines_[next_].size() > kLongestLine) {
+      ++next_;
+      return Read::kTooLong;
     }
     line = lines_[next_++];
-    return true;
+    return Read::kLine;
   }
   std::unique_ptr<WatchEnd> BeginWatch() override { return std::make_unique<EndedInput>(); }
   bool KeyEndsWatch() const override { return false; }
@@ -255,4 +259,41 @@ TEST_F(ConsoleTest, QuitStopsReadingLines) {
   EXPECT_TRUE(RunLines({"get_stat", ".quit", "get_stat"}));
   EXPECT_EQ(captured_.OutText(), "Disconnected\n");
   EXPECT_EQ(taken_, 2U);
+}
+
+TEST_F(ConsoleTest, TagsLongerThanSixteenMebibytesAreRefusedBeforeTheyAreRead) {
+  AddInstance("VELT");
+  EXPECT_FALSE(
+      RunLines({".read ?rx_token?string-1000000000", ".write ?tx_token?string-16777217 x",
+                "read ?rx_token?string-2147483647", "write ?tx_token?string-16777217 00",
+                "read  ?rx_token?string-1000000000", ".read ?SP_RemoteIP?string-16777216"}));
+  EXPECT_EQ(captured_.ErrText(),
+            "velt-host: cannot read ?rx_token?string-1000000000: its value of 1000000000 bytes "
+            "is longer than velt-host's limit of 16777216 bytes\n"
+            "velt-host: cannot write ?tx_token?string-16777217: its value of 16777217 bytes is "
+            "longer than velt-host's limit of 16777216 bytes\n"
+            "velt-host: cannot read ?rx_token?string-2147483647: its value of 2147483647 bytes "
+            "is longer than velt-host's limit of 16777216 bytes\n"
+            "velt-host: cannot write ?tx_token?string-16777217: its value of 16777217 bytes is "
+            "longer than velt-host's limit of 16777216 bytes\n");
+  // Two blanks make three words, which the instance's console refuses
+  // itself; a tag at the limit is read.
+  EXPECT_EQ(captured_.OutText(), "error: missing parameter (URI string)\n127.0.0.1\n");
+}
+
+TEST_F(ConsoleTest, AConsoleCommandIsCheckedUpToItsFirstZeroByteAsTheInstanceTakesIt) {
+  AddInstance("VELT");
+  // The instance sees "read ?rx_token?string-1000000000" only.
+  EXPECT_FALSE(RunLines({std::string("read ?rx_token?string-1000000000\0 more words", 44)}));
+  EXPECT_EQ(captured_.ErrText(),
+            "velt-host: cannot read ?rx_token?string-1000000000: its value of 1000000000 bytes "
+            "is longer than velt-host's limit of 16777216 bytes\n");
+  EXPECT_EQ(captured_.OutText(), "");
+}
+
+TEST_F(ConsoleTest, ALineLongerThanTheLimitIsRefusedAndTheNextOneRuns) {
+  AddInstance("VELT");
+  EXPECT_FALSE(RunLines({"get_stat", std::string(LineInput::kLongestLine + 1, 'x'), "get_stat"}));
+  EXPECT_EQ(captured_.ErrText(), "velt-host: a line longer than 1048576 bytes was refused\n");
+  EXPECT_EQ(captured_.OutText(), "Disconnected\nDisconnected\n");
 }

@@ -5,12 +5,15 @@
 #include <unistd.h>
 
 #include <chrono>
+#include <memory>
 #include <string>
+#include <thread>
 
 #include "FileDescriptor.h"
 #include "velt-host/StopSignals.h"
 
 using std::chrono::milliseconds;
+using velthost::LineInput;
 using velthost::StopSignals;
 using velthost::StreamInput;
 using velthost::WatchEnd;
@@ -46,15 +49,15 @@ TEST(StreamInput, SplitsLinesDropsCarriageReturnsAndKeepsALastLineWithoutLineFee
   pipe.Write("get_stat\r\n\n  put a b\nlast");
   pipe.Close();
   std::string line;
-  ASSERT_TRUE(input.Next(line));
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
   EXPECT_EQ(line, "get_stat");
-  ASSERT_TRUE(input.Next(line));
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
   EXPECT_EQ(line, "");
-  ASSERT_TRUE(input.Next(line));
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
   EXPECT_EQ(line, "  put a b");
-  ASSERT_TRUE(input.Next(line));
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
   EXPECT_EQ(line, "last");
-  EXPECT_FALSE(input.Next(line));
+  EXPECT_EQ(input.Next(line), LineInput::Read::kEnded);
   EXPECT_FALSE(input.KeyEndsWatch());
 }
 
@@ -72,9 +75,9 @@ TEST(StreamInput, WatchEndsAtTheEndOfInputAndKeepsLinesThatArriveMeanwhile) {
     EXPECT_EQ(end->Wait(milliseconds(1)), WatchEnd::Event::kInputEnded);
   }
   std::string line;
-  ASSERT_TRUE(input.Next(line));
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
   EXPECT_EQ(line, ".list");
-  EXPECT_FALSE(input.Next(line));
+  EXPECT_EQ(input.Next(line), LineInput::Read::kEnded);
 }
 
 TEST(StreamInput, StopSignalEndsTheInputAndTheWatch) {
@@ -83,10 +86,60 @@ TEST(StreamInput, StopSignalEndsTheInputAndTheWatch) {
   StreamInput input(pipe.ReadEnd(), signals);
   pipe.Write("first\nsecond\n");
   std::string line;
-  ASSERT_TRUE(input.Next(line));
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
   EXPECT_EQ(line, "first");
   ASSERT_EQ(::kill(::getpid(), SIGTERM), 0);
   EXPECT_EQ(input.BeginWatch()->Wait(milliseconds(1000)), WatchEnd::Event::kSignal);
-  EXPECT_FALSE(input.Next(line));
+  EXPECT_EQ(input.Next(line), LineInput::Read::kEnded);
   EXPECT_EQ(signals.Signal(), SIGTERM);
+}
+
+TEST(StreamInput, ALineLongerThanTheLimitIsDroppedWholeAndTheNextOneIsRead) {
+  StopSignals signals;
+  Pipe pipe;
+  StreamInput input(pipe.ReadEnd(), signals);
+  const std::string longest(LineInput::kLongestLine, 'a');
+  std::thread writer([&pipe, &longest] {
+    pipe.Write(longest + "\n");
+    pipe.Write(longest + "\r\n");
+    pipe.Write(longest + "b\n");
+    pipe.Write(std::string(5 * LineInput::kLongestLine, 'c') + "\nnext\n");
+    pipe.Write(longest + "d");
+    pipe.Close();
+  });
+  std::string line;
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
+  EXPECT_EQ(line, longest);
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
+  EXPECT_EQ(line, longest);
+  EXPECT_EQ(input.Next(line), LineInput::Read::kTooLong);
+  EXPECT_EQ(input.Next(line), LineInput::Read::kTooLong);
+  ASSERT_EQ(input.Next(line), LineInput::Read::kLine);
+  EXPECT_EQ(line, "next");
+  EXPECT_EQ(input.Next(line), LineInput::Read::kTooLong);
+  EXPECT_EQ(input.Next(line), LineInput::Read::kEnded);
+  writer.join();
+}
+
+TEST(StreamInput, AWatchStopsReadingWhenTheLinesWaitingFillTheInput) {
+  StopSignals signals;
+  Pipe pipe;
+  StreamInput input(pipe.ReadEnd(), signals);
+  std::thread writer([&pipe] {
+    pipe.Write(std::string(LineInput::kLongestLine + 100000, 'x'));
+    pipe.Close();
+  });
+  {
+    const std::unique_ptr<WatchEnd> end = input.BeginWatch();
+    while (!input.Full()) {
+      ASSERT_EQ(end->Wait(milliseconds(1000)), WatchEnd::Event::kNone);
+    }
+    // The rest stays in the pipe: the watch no longer sees the input end.
+    EXPECT_EQ(end->Wait(milliseconds(20)), WatchEnd::Event::kNone);
+    EXPECT_FALSE(input.Ended());
+  }
+  std::string line;
+  EXPECT_EQ(input.Next(line), LineInput::Read::kTooLong);
+  EXPECT_EQ(input.Next(line), LineInput::Read::kEnded);
+  writer.join();
 }

@@ -219,3 +219,12 @@ TEST(TypedValue, FormatThenParseGivesTheBytesBack) {
   bytes.insert(bytes.end(), second.begin(), second.end());
   EXPECT_EQ(Parsed(shape, TypedValue::Format(shape, bytes.data())), bytes);
 }
+
+TEST(TypedValue, AnEmptyTextFitsATextOfNoBytes) {
+  Bytes bytes{1, 2};
+  std::string error;
+  EXPECT_TRUE(TypedValue::Parse(Shape(ICU_STRING, 0), "", bytes, error));
+  EXPECT_EQ(bytes, Bytes());
+  EXPECT_FALSE(TypedValue::Parse(Shape(ICU_STRING, 0), "x", bytes, error));
+  EXPECT_EQ(error, "bad string-0 value 'x' (at most 0 bytes expected)");
+}

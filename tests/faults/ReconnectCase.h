@@ -1,0 +1,8 @@
+#pragma once
+
+#include "FaultCase.h"
+
+// A peer that accepts, sends three frames in separate writes and cuts the
+// connection, with a FIN and a reset in turn, 100 times: every complete
+// token must reach the queue, in order.
+void RunReconnect(FaultCase& fault, const FaultPrograms& programs);
