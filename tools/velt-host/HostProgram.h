@@ -4,10 +4,10 @@
 #include <string>
 #include <vector>
 
+#include "HostSocket.h"
 #include "velt-host/ConsoleOutput.h"
 #include "velt-host/HostOptions.h"
 #include "velt-host/StopSignals.h"
-#include "HostSocket.h"
 
 namespace velthost {
 
