@@ -20,5 +20,5 @@ ScriptedChannel::~ScriptedChannel() {
 
 void ScriptedChannel::Receive(const std::string& token) {
   TokenQueue::Guard held(protocol_->getTokenQueue());
-  protocol_->addToken(held, token);
+  held.addToken(token);
 }

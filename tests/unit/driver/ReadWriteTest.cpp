@@ -1,5 +1,8 @@
+#include <chrono>
 #include <cstring>
+#include <future>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "DriverFixture.h"
@@ -10,7 +13,7 @@ class ReadWriteTest : public DriverFixture {
  protected:
   void Queue(const std::string& token) {
     TokenQueue::Guard held(protocol->getTokenQueue());
-    protocol->addToken(held, token);
+    held.addToken(token);
   }
   std::size_t Queued() {
     TokenQueue::Guard held(protocol->getTokenQueue());
@@ -147,7 +150,7 @@ TEST_F(ReadWriteTest, StagedValueReadsBackBeforeItIsApplied) {
   ITag* const ip = Tag("?SP_RemoteIP?string-16");
   EXPECT_TRUE(WriteText(ip, "127.0.0.77"));
   EXPECT_EQ(ReadText(ip), "127.0.0.77");
-  EXPECT_EQ(protocol->getSettings().remoteIp, "127.0.0.1");
+  EXPECT_EQ(protocol->getSettings().text(Setting::RemoteIp), "127.0.0.1");
 }
 
 TEST_F(ReadWriteTest, StagedNumberAndFlagReadBackBeforeTheyAreApplied) {
@@ -158,8 +161,8 @@ TEST_F(ReadWriteTest, StagedNumberAndFlagReadBackBeforeTheyAreApplied) {
   EXPECT_TRUE(WriteBool(hex, true));
   EXPECT_EQ(ReadInt(gap), 100);
   EXPECT_TRUE(ReadBool(hex));
-  EXPECT_EQ(protocol->getSettings().gap, 0);
-  EXPECT_FALSE(protocol->getSettings().hexTokens);
+  EXPECT_EQ(protocol->getSettings().number(Setting::Gap), 0);
+  EXPECT_FALSE(protocol->getSettings().flag(Setting::HexTokens));
 }
 
 TEST_F(ReadWriteTest, PortReadsTheLowTwoBytesOfTheValue) {
@@ -288,7 +291,7 @@ TEST_F(ReadWriteTest, AppliedGapTakesEffectWithoutANewSocket) {
   Connected(kTcpConfig);
   EXPECT_TRUE(WriteInt(Tag("?SP_Gap?unsignedInt"), 100));
   EXPECT_TRUE(WriteBool(Tag("?SP_Done?boolean"), false));
-  EXPECT_EQ(protocol->getSettings().gap, 100);
+  EXPECT_EQ(protocol->getSettings().number(Setting::Gap), 100);
   sockets.ClearLog();
   Sock().AddStream("x");
   Pass();
@@ -309,7 +312,34 @@ TEST_F(ReadWriteTest, ApplyPersistsUnderTheInstanceAndKeepsTheStagedValues) {
   storage.clearCalls();
   EXPECT_TRUE(WriteBool(done, true));
   EXPECT_EQ(storage.writes().size(), 2U);
-  EXPECT_EQ(protocol->getSettings().txPrefix, "0A");
+  EXPECT_EQ(protocol->getSettings().text(Setting::TxPrefix), "0A");
+}
+
+TEST_F(ReadWriteTest, ApplyWritesStorageAfterReadersSeeWhatItApplied) {
+  Started(kUdpConfig);
+  Queue("old");
+  ITag* const available = Tag("?tokens_available?unsignedInt");
+  EXPECT_TRUE(WriteInt(Tag("?SP_Gap?unsignedInt"), 30));
+  EXPECT_TRUE(WriteText(Tag("?SP_TxPrefix?string-8"), "0A"));
+  // While the apply writes each value to storage, another thread reads: the
+  // channel's lock is free, and the applied values and the emptied queue
+  // are there to see.
+  std::vector<std::future<std::pair<int, int>>> reads;
+  std::vector<bool> answered;
+  storage.onWrite([&](const std::string& /*name*/) {
+    reads.push_back(std::async(std::launch::async, [&] {
+      return std::make_pair(ReadInt(available), protocol->getSettings().number(Setting::Gap));
+    }));
+    answered.push_back(reads.back().wait_for(std::chrono::seconds(10)) ==
+                       std::future_status::ready);
+  });
+  EXPECT_TRUE(WriteBool(Tag("?SP_Done?boolean"), true));
+  storage.onWrite(nullptr);
+  ASSERT_EQ(reads.size(), 2U);
+  EXPECT_EQ(answered, (std::vector<bool>{true, true}));
+  for (auto& read : reads) {
+    EXPECT_EQ(read.get(), std::make_pair(0, 30));
+  }
 }
 
 TEST_F(ReadWriteTest, QueueBoundWrittenAtRunTimeOfZeroKeepsTheNewestToken) {
