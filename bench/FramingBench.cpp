@@ -165,13 +165,7 @@ void BM_WorkerPass(benchmark::State& state) {
       "rx_suffix=03",
       true);
   Protocol_VELT& protocol = channel.Protocol();
-  protocol.Task();
-  std::string reply(64, '\0');
-  protocol.DoCommand("connect ON", reply.data(), static_cast<int>(reply.size()));
-  protocol.Task();
-  ScriptedSocket& socket = *channel.Sockets().Last();
-  socket.KeepRecords(false);
-  socket.AddRepeatedStream("\x02" + Body(body, 0) + "\x03", 1000000000);
+  channel.Connect().AddRepeatedStream("\x02" + Body(body, 0) + "\x03", 1000000000);
   for (int i = 0; i < 1000; ++i) {
     protocol.Task();
   }

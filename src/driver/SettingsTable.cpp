@@ -72,6 +72,16 @@ constexpr bool RowsFollowTheSettings() {
 }
 static_assert(RowsFollowTheSettings(), "the rows are in the order of Setting");
 
+constexpr bool ApplyPositionsAreAPermutation() {
+  unsigned int seen = 0;
+  for (const SettingRow& row : kRows) {
+    seen |= row.applyPosition < kSettingCount ? 1U << row.applyPosition : 0U;
+  }
+  return seen == (1U << kSettingCount) - 1U;
+}
+static_assert(ApplyPositionsAreAPermutation(),
+              "every setting has its own place in the apply order");
+
 constexpr std::array<const SettingRow*, kSettingCount> BuildApplyOrder() {
   std::array<const SettingRow*, kSettingCount> order{};
   for (const SettingRow& row : kRows) {
@@ -80,16 +90,6 @@ constexpr std::array<const SettingRow*, kSettingCount> BuildApplyOrder() {
   return order;
 }
 constexpr std::array<const SettingRow*, kSettingCount> kApplyOrder = BuildApplyOrder();
-
-constexpr bool ApplyOrderIsComplete() {
-  for (const SettingRow* row : kApplyOrder) {
-    if (row == nullptr) {
-      return false;
-    }
-  }
-  return true;
-}
-static_assert(ApplyOrderIsComplete(), "every setting has its own place in the apply order");
 
 }  // namespace
 

@@ -53,7 +53,6 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   if (fields.size() != 3) {
     return fail("there must be 3 tag specification fields");
   }
-  const std::string& nodeField = fields[0];
   const std::string& memoryTypeField = fields[1];
   const std::string& dataTypeField = fields[2];
   if (memoryTypeField.empty()) {
@@ -62,7 +61,12 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   if (dataTypeField.empty()) {
     return fail("tavuType field missing");
   }
-  const _VELT::ParamManager& parameters = protocol->getParamManager();
+  return resolveNode(*protocol, fields[0]) && resolveMemoryType(*protocol, memoryTypeField) &&
+         resolveDataType(dataTypeField);
+}
+
+bool Tag_VELT::resolveNode(const Protocol_VELT& protocol, const std::string& nodeField) {
+  const _VELT::ParamManager& parameters = protocol.getParamManager();
   commonParams = parameters.getCommonParams();
   if (commonParams == nullptr) {
     return fail("Can't access protocol common parameters");
@@ -72,19 +76,26 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   if (nodeParams == nullptr) {
     return fail("Can't access protocol node parameters");
   }
-  const MemoryManager& memory = protocol->getMemoryManager();
+  return true;
+}
+
+bool Tag_VELT::resolveMemoryType(const Protocol_VELT& protocol, const std::string& field) {
+  const MemoryManager& memory = protocol.getMemoryManager();
   model = memory.getModel(nodeParams->model);
   if (model == nullptr) {
     return fail("Can't access model");
   }
-  memoryType = memory.getMemoryType(nodeParams->model, memoryTypeField);
+  memoryType = memory.getMemoryType(nodeParams->model, field);
   if (memoryType == nullptr) {
     return fail("Can't access memory type");
   }
+  return true;
+}
+
+bool Tag_VELT::resolveDataType(const std::string& field) {
   int length = 0;
-  if (!ProtUtilsN::GetTAVUType(dataTypeField, varType, itemType, length, conversions) ||
-      length < 0) {
-    return fail(dataTypeField + ": data type unknown");
+  if (!ProtUtilsN::GetTAVUType(field, varType, itemType, length, conversions) || length < 0) {
+    return fail(field + ": data type unknown");
   }
   varLength = length;
   if ((ProtUtilsN::GetTypeFlag(GetVarType()) & memoryType->getTavuTypes()) == 0) {

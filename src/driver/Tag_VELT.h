@@ -52,6 +52,12 @@ class Tag_VELT final : public TagBase {
 
  private:
   bool parseTagUrl(Protocol_VELT* protocol);
+  // The steps of the parse, in their order: the node and its parameters;
+  // the model and the memory type; the data type, checked against the
+  // memory type, and the memory type's role.
+  bool resolveNode(const Protocol_VELT& protocol, const std::string& nodeField);
+  bool resolveMemoryType(const Protocol_VELT& protocol, const std::string& field);
+  bool resolveDataType(const std::string& field);
   bool fail(const std::string& text) const;
 
   std::int32_t valid = 0;

@@ -116,10 +116,11 @@ void TokenChannel::adoptSettings() {
 }
 
 void TokenChannel::supervise() {
-  if (state_ == State::Connected && (linkBroken() || !connectRequested)) {
-    state_ = State::Renewing;
-  } else if (settings_.text(Setting::RemoteIp) != lastRemoteIp ||
-             settings_.number(Setting::RemotePort) != lastRemotePort) {
+  // A connection that broke or is no longer wanted, or a socket made for
+  // another remote address, is replaced.
+  const bool dropped = state_ == State::Connected && (linkBroken() || !connectRequested);
+  if (dropped || settings_.text(Setting::RemoteIp) != lastRemoteIp ||
+      settings_.number(Setting::RemotePort) != lastRemotePort) {
     state_ = State::Renewing;
   }
 }

@@ -48,7 +48,7 @@ class TokenChannel final : private TokenSink, private PassGate {
   TokenChannel(TokenChannel&&) = delete;
   TokenChannel& operator=(TokenChannel&&) = delete;
   // Deletes a socket that Stop did not.
-  ~TokenChannel();
+  virtual ~TokenChannel();
 
   // Start, before the worker runs: takes the settings and requests as they
   // stand; not connected.

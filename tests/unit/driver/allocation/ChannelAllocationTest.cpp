@@ -21,18 +21,6 @@ std::string Frame(std::size_t bodyBytes, char fill) {
 
 class ChannelAllocation : public ::testing::Test {
  protected:
-  // A connected channel whose socket then receives frames without end.
-  ScriptedSocket& Connect(ScriptedChannel& channel) {
-    Protocol_VELT& protocol = channel.Protocol();
-    protocol.Task();
-    std::string reply(64, '\0');
-    protocol.DoCommand("connect ON", reply.data(), static_cast<int>(reply.size()));
-    protocol.Task();
-    ScriptedSocket& socket = *channel.Sockets().Last();
-    socket.KeepRecords(false);
-    return socket;
-  }
-
   // Allocations of count passes after the warm-up.
   static std::uint64_t AllocationsOfPasses(Protocol_VELT& protocol, int count) {
     for (int i = 0; i < kWarmUpPasses; ++i) {
@@ -57,7 +45,7 @@ const char kUdp[] =
 
 TEST_F(ChannelAllocation, StreamTokensOfFifteenBytesAllocateNothing) {
   ScriptedChannel channel(kTcp, true);
-  ScriptedSocket& socket = Connect(channel);
+  ScriptedSocket& socket = channel.Connect();
   socket.AddRepeatedStream(Frame(15, 'a'), 100000);
   // One token per pass.
   EXPECT_EQ(AllocationsOfPasses(channel.Protocol(), 2000), 0U);
@@ -65,7 +53,7 @@ TEST_F(ChannelAllocation, StreamTokensOfFifteenBytesAllocateNothing) {
 
 TEST_F(ChannelAllocation, HexStreamTokensOfFifteenBytesAllocateNothing) {
   ScriptedChannel channel(std::string(kTcp) + " hex_tokens=true", true);
-  ScriptedSocket& socket = Connect(channel);
+  ScriptedSocket& socket = channel.Connect();
   socket.AddRepeatedStream(Frame(15, 'a'), 100000);
   EXPECT_EQ(AllocationsOfPasses(channel.Protocol(), 2000), 0U);
 }
@@ -73,7 +61,7 @@ TEST_F(ChannelAllocation, HexStreamTokensOfFifteenBytesAllocateNothing) {
 TEST_F(ChannelAllocation, LongerStreamTokensAllocateAtMostOnceEach) {
   for (const std::size_t body : {16U, 64U, 65U, 999U}) {
     ScriptedChannel channel(kTcp, true);
-    ScriptedSocket& socket = Connect(channel);
+    ScriptedSocket& socket = channel.Connect();
     socket.AddRepeatedStream(Frame(body, 'b'), 100000);
     EXPECT_LE(AllocationsOfPasses(channel.Protocol(), 1000), 1000U) << body;
   }
@@ -81,7 +69,7 @@ TEST_F(ChannelAllocation, LongerStreamTokensAllocateAtMostOnceEach) {
 
 TEST_F(ChannelAllocation, DatagramTokensOfFifteenBytesAllocateNothing) {
   ScriptedChannel channel(kUdp, true);
-  ScriptedSocket& socket = Connect(channel);
+  ScriptedSocket& socket = channel.Connect();
   // Each pass takes every datagram there is: one per pass here, the pass
   // ending on the time-out after it.
   for (int i = 0; i < kWarmUpPasses + 1000; ++i) {
