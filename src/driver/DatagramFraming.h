@@ -20,10 +20,10 @@ class DatagramFraming {
   void Feed(const unsigned char* data, std::size_t length, TokenSink& sink) const;
 
  private:
-  // Position of the first match of marker in data[from, end) before any
-  // zero byte, or end when there is none.
+  // Position of the first match of marker that lies whole in
+  // data[from, limit), or limit when there is none.
   static std::size_t Find(const std::string& marker, const unsigned char* data, std::size_t from,
-                          std::size_t end);
+                          std::size_t limit);
 
   std::string prefix_;
   std::string suffix_;
