@@ -126,11 +126,13 @@ void BM_TcpIngestNoReader(benchmark::State& state, bool prefixOnly) {
 }
 
 // The same stream (STX/ETX), read and acknowledged token by token by the
-// benchmark's thread as a panel does.
+// benchmark's thread as a panel does. While the queue is empty the reader
+// yields and asks again at once (range(0) 0), or polls every range(0)
+// microseconds.
 void BM_TcpStreamReadAndAcknowledged(benchmark::State& state) {
   try {
     TcpChannel tcp("rx_prefix=02 rx_suffix=03");
-    TokenReader reader(tcp.Channel());
+    TokenReader reader(tcp.Channel(), std::chrono::microseconds(state.range(0)));
     const std::vector<std::string> payloads = BenchStreams::Payloads(kStreamTokens, kPayload);
     const LoopbackIo::Bytes frames = BenchStreams::Framed(payloads, "\x02", "\x03");
     std::string error;
@@ -222,9 +224,14 @@ class PlainBurstReceiver final : public BurstReceiver {
   int fd_;
 };
 
-// A burst of kBurstDatagrams datagrams, one STX/ETX token each, sent as fast
-// as the sender goes to the plug-in's channel or to a plain recv loop.
+// A burst of kBurstDatagrams datagrams, one STX/ETX token each, sent to the
+// plug-in's channel or to a plain recv loop: as fast as the sender goes
+// (range(0) 0), or range(0) datagrams per second.
 void BM_UdpBurst(benchmark::State& state, bool plain) {
+  const auto rate = static_cast<int>(state.range(0));
+  const Clock::duration spacing =
+      rate == 0 ? Clock::duration::zero()
+                : std::chrono::duration_cast<Clock::duration>(std::chrono::seconds(1)) / rate;
   std::size_t received = 0;
   try {
     std::uint16_t senderPort = 0;
@@ -259,8 +266,11 @@ void BM_UdpBurst(benchmark::State& state, bool plain) {
       std::atomic<bool> sending{true};
       const auto start = Clock::now();
       JoiningThread burst([&] {
-        for (const LoopbackIo::Bytes& datagram : datagrams) {
-          LoopbackIo::SendTo(sender.Get(), target, datagram);
+        for (std::size_t i = 0; i < datagrams.size(); ++i) {
+          if (rate != 0) {
+            std::this_thread::sleep_until(start + static_cast<int>(i) * spacing);
+          }
+          LoopbackIo::SendTo(sender.Get(), target, datagrams[i]);
         }
         sending = false;
       });
@@ -287,6 +297,21 @@ BENCHMARK_CAPTURE(BM_TcpIngestNoReader, prefix_only, true)
     ->Arg(16)
     ->UseManualTime()
     ->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_TcpStreamReadAndAcknowledged)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(BM_UdpBurst, channel, false)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK_CAPTURE(BM_UdpBurst, plain_recv, true)->UseManualTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_TcpStreamReadAndAcknowledged)
+    ->ArgName("idle_wait_us")
+    ->Arg(0)
+    ->Arg(50)
+    ->UseManualTime()
+    ->Unit(benchmark::kMillisecond);
+BENCHMARK_CAPTURE(BM_UdpBurst, channel, false)
+    ->ArgName("per_second")
+    ->Arg(0)
+    ->Arg(50000)
+    ->UseManualTime()
+    ->Unit(benchmark::kMillisecond);
+BENCHMARK_CAPTURE(BM_UdpBurst, plain_recv, true)
+    ->ArgName("per_second")
+    ->Arg(0)
+    ->Arg(50000)
+    ->UseManualTime()
+    ->Unit(benchmark::kMillisecond);
