@@ -12,6 +12,7 @@
 #include <thread>
 #include <vector>
 
+#include "BenchStreams.h"
 #include "LoopbackChannel.h"
 #include "LoopbackIo.h"
 #include "PeerDrain.h"
@@ -29,30 +30,12 @@ constexpr auto kTokenTimeout = std::chrono::milliseconds(2000);
 constexpr auto kDeliveryTimeout = std::chrono::seconds(2);
 constexpr std::uint32_t kLoopback = 0x7F000001U;
 
-std::string Payload(std::size_t index) {
-  std::string payload(kPayload, 'p');
-  const std::string number = std::to_string(index);
-  payload.replace(0, number.size(), number);
-  return payload;
-}
-
 std::vector<std::string> Payloads(std::size_t count) {
-  std::vector<std::string> payloads;
-  for (std::size_t i = 0; i < count; ++i) {
-    payloads.push_back(Payload(i));
-  }
-  return payloads;
+  return BenchStreams::Payloads(count, kPayload);
 }
 
-// The payloads, each framed by STX and ETX.
 LoopbackIo::Bytes Framed(const std::vector<std::string>& payloads) {
-  LoopbackIo::Bytes frames;
-  for (const std::string& payload : payloads) {
-    frames.push_back(0x02);
-    frames.insert(frames.end(), payload.begin(), payload.end());
-    frames.push_back(0x03);
-  }
-  return frames;
+  return BenchStreams::Framed(payloads, "\x02", "\x03");
 }
 
 // A port nobody holds right now, for the channel's own socket.
@@ -83,7 +66,7 @@ void BM_UdpTokensReadAndAcknowledged(benchmark::State& state) {
     std::uint16_t peerPort = 0;
     const FileDescriptor peer = LoopbackIo::BindUdp(kLoopback, peerPort);
     const std::uint16_t local = FreeUdpPort();
-    LoopbackChannel channel(VELT_PLUGIN_PATH, Config("UDP", peerPort, local));
+    LoopbackChannel channel(LoopbackChannel::PluginPath(), Config("UDP", peerPort, local));
     if (!channel.Connect(kConnectTimeout)) {
       state.SkipWithError("the channel did not connect");
       return;
@@ -112,7 +95,7 @@ void BM_TcpTokensReadAndAcknowledged(benchmark::State& state) {
   try {
     std::uint16_t port = 0;
     const FileDescriptor listener = LoopbackIo::Listen(1, port);
-    LoopbackChannel channel(VELT_PLUGIN_PATH, Config("TCP", port, 0));
+    LoopbackChannel channel(LoopbackChannel::PluginPath(), Config("TCP", port, 0));
     if (!channel.Connect(kConnectTimeout)) {
       state.SkipWithError("the channel did not connect");
       return;
@@ -148,7 +131,7 @@ void BM_TxTokenSend(benchmark::State& state, bool tcp) {
     std::uint16_t port = 0;
     const FileDescriptor listener =
         tcp ? LoopbackIo::Listen(1, port) : LoopbackIo::BindUdp(kLoopback, port);
-    LoopbackChannel channel(VELT_PLUGIN_PATH,
+    LoopbackChannel channel(LoopbackChannel::PluginPath(),
                             Config(tcp ? "TCP" : "UDP", port, tcp ? 0 : FreeUdpPort()));
     if (!channel.Connect(kConnectTimeout)) {
       state.SkipWithError("the channel did not connect");
@@ -164,7 +147,7 @@ void BM_TxTokenSend(benchmark::State& state, bool tcp) {
     const PeerDrain drain(peer);
     ITag* const tx = channel.Tag("?tx_token?string-64");
     unsigned char text[65] = {};
-    const std::string payload = Payload(0);
+    const std::string payload = BenchStreams::Payload(0, kPayload);
     std::memcpy(text, payload.data(), payload.size());
     for (auto _ : state) {
       if (!channel.Protocol().Write(tx, text)) {

@@ -1,11 +1,20 @@
 #include "LoopbackChannel.h"
 
+#include <algorithm>
+#include <cstdlib>
 #include <cstring>
 #include <stdexcept>
 #include <thread>
+#include <vector>
 
-LoopbackChannel::LoopbackChannel(const std::string& pluginPath, const std::string& config)
-    : host_("") {
+std::string LoopbackChannel::PluginPath() {
+  const char* const chosen = std::getenv("VELT_BENCH_PLUGIN");
+  return chosen != nullptr && *chosen != '\0' ? chosen : VELT_PLUGIN_PATH;
+}
+
+LoopbackChannel::LoopbackChannel(const std::string& pluginPath, const std::string& config,
+                                 const std::string& storagePath)
+    : host_(storagePath) {
   plugin_ = std::make_unique<PluginLoader>(pluginPath, host_);
   protocol_ = plugin_->Protocols().CreateProtocol("VELT");
   if (protocol_ == nullptr) {
@@ -64,3 +73,25 @@ int LoopbackChannel::ReadInt(ITag* tag) {
 }
 
 std::string LoopbackChannel::LastError() const { return protocol_->GetLastErrorString(); }
+
+bool LoopbackChannel::WriteInt(ITag* tag, int value) {
+  unsigned char bytes[4] = {};
+  std::memcpy(bytes, &value, sizeof value);
+  return protocol_->Write(tag, bytes);
+}
+
+bool LoopbackChannel::WriteBool(ITag* tag, bool value) {
+  const unsigned char byte = value ? 1 : 0;
+  return protocol_->Write(tag, &byte);
+}
+
+bool LoopbackChannel::WriteText(ITag* tag, const std::string& text) {
+  std::vector<unsigned char> bytes(static_cast<std::size_t>(tag->GetVarLength()) + 1, 0);
+  std::memcpy(bytes.data(), text.data(), std::min(text.size(), bytes.size() - 1));
+  return protocol_->Write(tag, bytes.data());
+}
+
+bool LoopbackChannel::SetQueueBound(int bound) {
+  return WriteInt(Tag("?SP_TokenQueueSize?unsignedInt"), bound) &&
+         WriteBool(Tag("?SP_Done?boolean"), true);
+}

@@ -10,14 +10,22 @@
 #include "ITag.h"
 #include "PluginLoader.h"
 
-// The built plug-in loaded into the reference host (without permanent
-// storage) as a panel loads it, with one channel configured and started.
-// Everything goes through the host's protocol interface.
+// The plug-in loaded into the reference host as a panel loads it, with one
+// channel configured and started. Everything goes through the host's
+// protocol interface.
 class LoopbackChannel {
  public:
-  // Throws std::runtime_error when the plug-in does not load or the channel
-  // refuses its configuration.
-  LoopbackChannel(const std::string& pluginPath, const std::string& config);
+  // The plug-in the benchmarks load: the one named by the environment
+  // variable VELT_BENCH_PLUGIN when it is set (so one build of the
+  // benchmarks can measure another build of the plug-in, such as the one
+  // before a change), else the one built with them.
+  static std::string PluginPath();
+
+  // storagePath is the host's permanent storage file; empty for a host
+  // without one. Throws std::runtime_error when the plug-in does not load or
+  // the channel refuses its configuration.
+  LoopbackChannel(const std::string& pluginPath, const std::string& config,
+                  const std::string& storagePath = "");
   LoopbackChannel(const LoopbackChannel&) = delete;
   LoopbackChannel& operator=(const LoopbackChannel&) = delete;
   LoopbackChannel(LoopbackChannel&&) = delete;
@@ -33,6 +41,13 @@ class LoopbackChannel {
   bool Connect(std::chrono::milliseconds timeout);
   // The tag's value read as a 32-bit integer (0 when the read fails).
   int ReadInt(ITag* tag);
+  bool WriteInt(ITag* tag, int value);
+  bool WriteBool(ITag* tag, bool value);
+  // Writes text, zero-terminated, to a text tag.
+  bool WriteText(ITag* tag, const std::string& text);
+  // Stages the token queue's bound and applies it (the configuration allows
+  // at most 10000).
+  bool SetQueueBound(int bound);
   // The channel's last error text.
   std::string LastError() const;
 

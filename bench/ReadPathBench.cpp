@@ -134,7 +134,51 @@ void BM_DriverRead(benchmark::State& state, const char* memoryType) {
   state.SetBytesProcessed(state.iterations() * tag->PackedLen());
 }
 
+// An apply (SP_Done) of eight staged runtime parameters on a started
+// channel over scripted host services, whose permanent storage is in
+// memory: the apply's own cost, of which the part under queueLock is a
+// share (the staging is not timed).
+void BM_DriverApply(benchmark::State& state) {
+  ScriptedChannel channel(
+      "CfgVer=1 model=1 socketType=UDP remoteIpAddress=127.0.0.1 remotePort=5000", true);
+  Protocol_VELT& protocol = channel.Protocol();
+  const auto tag = [&protocol](const char* uri) { return protocol.CreateTag(uri); };
+  ITag* const gap = tag("?SP_Gap?unsignedInt");
+  ITag* const queue = tag("?SP_TokenQueueSize?unsignedInt");
+  ITag* const hex = tag("?SP_HexTokens?boolean");
+  ITag* const done = tag("?SP_Done?boolean");
+  std::vector<ITag*> texts;
+  for (const char* uri : {"?SP_RxPrefix?string-8", "?SP_RxSuffix?string-8", "?SP_TxPrefix?string-8",
+                          "?SP_TxSuffix?string-8", "?SP_RemoteIP?string-16"}) {
+    texts.push_back(tag(uri));
+  }
+  int round = 0;
+  bool applied = true;
+  for (auto _ : state) {
+    state.PauseTiming();
+    const int value = 100 + round % 7;
+    const bool odd = ++round % 2 != 0;
+    protocol.Write(gap, reinterpret_cast<const unsigned char*>(&value));
+    protocol.Write(queue, reinterpret_cast<const unsigned char*>(&value));
+    const unsigned char flag = odd ? 1 : 0;
+    protocol.Write(hex, &flag);
+    for (std::size_t i = 0; i < texts.size(); ++i) {
+      const std::string text = i + 1 == texts.size() ? "127.0.0.1" : (odd ? "02" : "0A0B");
+      std::vector<unsigned char> bytes(text.begin(), text.end());
+      bytes.resize(17, 0);
+      protocol.Write(texts[i], bytes.data());
+    }
+    state.ResumeTiming();
+    applied = protocol.Write(done, &flag) && applied;
+  }
+  if (!applied) {
+    state.SkipWithError(protocol.GetLastErrorString());
+  }
+}
+
 }  // namespace
+
+BENCHMARK(BM_DriverApply);
 
 BENCHMARK_CAPTURE(BM_BaseRead, binary, "binary-", "")
     ->Arg(1)

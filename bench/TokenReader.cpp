@@ -3,11 +3,12 @@
 #include <cstring>
 #include <thread>
 
-TokenReader::TokenReader(LoopbackChannel& channel)
+TokenReader::TokenReader(LoopbackChannel& channel, std::chrono::microseconds idleWait)
     : channel_(channel),
       available_(channel.Tag("?tokens_available?unsignedInt")),
       rx_(channel.Tag("?rx_token?string-64")),
-      ack_(channel.Tag("?token_ack?boolean")) {}
+      ack_(channel.Tag("?token_ack?boolean")),
+      idleWait_(idleWait) {}
 
 bool TokenReader::Take(const std::vector<std::string>& expected, std::chrono::milliseconds timeout,
                        std::string& error) {
@@ -20,7 +21,11 @@ bool TokenReader::Take(const std::vector<std::string>& expected, std::chrono::mi
         error = "tokens did not arrive in time";
         return false;
       }
-      std::this_thread::yield();
+      if (idleWait_.count() == 0) {
+        std::this_thread::yield();
+      } else {
+        std::this_thread::sleep_for(idleWait_);
+      }
       continue;
     }
     for (int i = 0; i < waiting && taken < expected.size(); ++i, ++taken) {

@@ -92,7 +92,7 @@ void RunLines(const std::vector<std::string>& lines, std::uint8_t flags) {
   auto& protocol = dynamic_cast<Protocol_VELT&>(instances.front()->Protocol());
   for (unsigned i = 0; i < (flags & 3U); ++i) {
     TokenQueue::Guard held(protocol.getTokenQueue());
-    protocol.addToken(held, Token(static_cast<int>(i % 2)));
+    held.addToken(Token(static_cast<int>(i % 2)));
   }
   MemoryFile out;
   MemoryFile err;

@@ -152,20 +152,20 @@ void CheckChannelStart(HostPermanentStorage& storage, const std::string& section
   Require(channel.Config(kConfig), "the configuration is accepted");
   channel.Start();
   const ChannelSettings read = channel.getSettings();
-  Require(read.socketType == TextRead(entries, "socket_type", "UDP") &&
-              read.remoteIp == TextRead(entries, "remote_ip_address", "127.0.0.1") &&
-              read.localIp == TextRead(entries, "local_ip_address", "0.0.0.0") &&
-              read.broadcastType == TextRead(entries, "broadcast_type", "Global") &&
-              read.rxPrefix == TextRead(entries, "rx_prefix", "02") &&
-              read.rxSuffix == TextRead(entries, "rx_suffix", "03") &&
-              read.txPrefix == TextRead(entries, "tx_prefix", "04") &&
-              read.txSuffix == TextRead(entries, "tx_suffix", "05"),
+  Require(read.text(Setting::SocketType) == TextRead(entries, "socket_type", "UDP") &&
+              read.text(Setting::RemoteIp) == TextRead(entries, "remote_ip_address", "127.0.0.1") &&
+              read.text(Setting::LocalIp) == TextRead(entries, "local_ip_address", "0.0.0.0") &&
+              read.text(Setting::BroadcastType) == TextRead(entries, "broadcast_type", "Global") &&
+              read.text(Setting::RxPrefix) == TextRead(entries, "rx_prefix", "02") &&
+              read.text(Setting::RxSuffix) == TextRead(entries, "rx_suffix", "03") &&
+              read.text(Setting::TxPrefix) == TextRead(entries, "tx_prefix", "04") &&
+              read.text(Setting::TxSuffix) == TextRead(entries, "tx_suffix", "05"),
           "a channel starts with the stored texts, or its configuration's");
-  Require(read.remotePort == NumberRead(entries, "remote_port", 5000) &&
-              read.localPort == NumberRead(entries, "local_port", 6000) &&
-              read.gap == NumberRead(entries, "gap", 7) &&
-              read.tokenQueueSize == NumberRead(entries, "token_queue_size", 9) &&
-              read.hexTokens == FlagRead(entries, "hex_tokens", false),
+  Require(read.number(Setting::RemotePort) == NumberRead(entries, "remote_port", 5000) &&
+              read.number(Setting::LocalPort) == NumberRead(entries, "local_port", 6000) &&
+              read.number(Setting::Gap) == NumberRead(entries, "gap", 7) &&
+              read.number(Setting::TokenQueueSize) == NumberRead(entries, "token_queue_size", 9) &&
+              read.flag(Setting::HexTokens) == FlagRead(entries, "hex_tokens", false),
           "a channel starts with the stored numbers and flag, or its configuration's");
   channel.Stop();
 }

@@ -66,18 +66,33 @@ bool GroupParameterReplacer::get(const std::string& name, int node, bool& out) c
 }
 
 void GroupParameterReplacer::activate(ParameterReplacer& live, int node, bool persist) const {
+  const Applied applied = apply(live, node);
+  if (persist) {
+    GroupParameterReplacer::persist(live, applied);
+  }
+}
+
+GroupParameterReplacer::Applied GroupParameterReplacer::apply(ParameterReplacer& live,
+                                                              int node) const {
+  Applied applied;
   const std::lock_guard<std::mutex> lock(mutex);
   for (const auto& [fullName, entry] : values) {
     if (entry.node != node) {
       continue;
     }
-    const std::string liveName = ParameterReplacer::makeFullName(entry.name, node);
-    const ParameterReplacer::Variant value = ToLive(entry);
-    // The live set refuses an entry of an unknown type; such an entry is
-    // neither applied nor persisted.
-    if (live.set(liveName, value) && persist) {
-      live.persist(liveName, value);
+    std::string liveName = ParameterReplacer::makeFullName(entry.name, node);
+    ParameterReplacer::Variant value = ToLive(entry);
+    // The live set refuses an entry of an unknown type.
+    if (live.set(liveName, value)) {
+      applied.emplace_back(std::move(liveName), std::move(value));
     }
+  }
+  return applied;
+}
+
+void GroupParameterReplacer::persist(const ParameterReplacer& live, const Applied& applied) {
+  for (const auto& [liveName, value] : applied) {
+    live.persist(liveName, value);
   }
 }
 

@@ -4,6 +4,8 @@
 #include <map>
 #include <mutex>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "config/ParameterReplacer.h"
 
@@ -55,9 +57,20 @@ class GroupParameterReplacer {
   bool get(const std::string& name, int node, int& out) const;
   bool get(const std::string& name, int node, bool& out) const;
 
+  // What an apply copied into the live set, in the order it copied it: each
+  // live full name with its value.
+  using Applied = std::vector<std::pair<std::string, ParameterReplacer::Variant>>;
+
   // Copies every staged entry of node, in full-name order, into live and,
   // when persist is true, into permanent storage under live's section.
   void activate(ParameterReplacer& live, int node, bool persist) const;
+  // activate in two steps, so that a caller can change the live set under
+  // its own lock and write to storage after releasing it: apply copies the
+  // staged entries of node into live and answers what it copied; persist
+  // then writes that to permanent storage under live's section, in the same
+  // order. Entries of an unknown type are neither applied nor persisted.
+  Applied apply(ParameterReplacer& live, int node) const;
+  static void persist(const ParameterReplacer& live, const Applied& applied);
 
   // A copy of every staged entry, in full-name order.
   std::map<std::string, Variant> entries() const;

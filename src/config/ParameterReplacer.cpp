@@ -101,8 +101,14 @@ void ParameterReplacer::persist(const std::string& fullName, const Variant& valu
   if (piPermanentStorage == nullptr) {
     return;
   }
-  const std::lock_guard<std::mutex> lock(mutex);
-  const char* const sectionText = section.c_str();
+  // The storage write may take long (a durable store syncs it to disk), so
+  // the set is not held meanwhile: readers of live values go on.
+  std::string sectionCopy;
+  {
+    const std::lock_guard<std::mutex> lock(mutex);
+    sectionCopy = section;
+  }
+  const char* const sectionText = sectionCopy.c_str();
   const char* const nameText = fullName.c_str();
   switch (value.type) {
     case kBoolean:

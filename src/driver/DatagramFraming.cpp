@@ -1,6 +1,5 @@
 #include "driver/DatagramFraming.h"
 
-#include <algorithm>
 #include <cstring>
 
 namespace {
@@ -13,38 +12,48 @@ DatagramFraming::DatagramFraming(const std::string& prefix, const std::string& s
     : prefix_(UpToZero(prefix)), suffix_(UpToZero(suffix)) {}
 
 std::size_t DatagramFraming::Find(const std::string& marker, const unsigned char* data,
-                                  std::size_t from, std::size_t end) {
-  const auto* const zero =
-      static_cast<const unsigned char*>(std::memchr(data + from, 0, end - from));
-  const std::size_t limit = zero == nullptr ? end : static_cast<std::size_t>(zero - data);
-  const auto* const first = data + from;
-  const auto* const last = data + limit;
-  const auto* const match =
-      std::search(first, last, marker.begin(), marker.end(),
-                  [](unsigned char a, char b) { return a == static_cast<unsigned char>(b); });
-  return match == last ? end : static_cast<std::size_t>(match - data);
+                                  std::size_t from, std::size_t limit) {
+  const auto first = static_cast<unsigned char>(marker[0]);
+  for (std::size_t at = from; at + marker.size() <= limit; ++at) {
+    const void* const hit = std::memchr(data + at, first, limit + 1 - marker.size() - at);
+    if (hit == nullptr) {
+      return limit;
+    }
+    at = static_cast<std::size_t>(static_cast<const unsigned char*>(hit) - data);
+    if (std::memcmp(data + at, marker.data(), marker.size()) == 0) {
+      return at;
+    }
+  }
+  return limit;
 }
 
-void DatagramFraming::Split(const unsigned char* data, std::size_t length,
-                            const std::function<void(std::string)>& emit) const {
+void DatagramFraming::Feed(const unsigned char* data, std::size_t length, TokenSink& sink) const {
+  // A search from p sees the bytes before the first zero byte at or after
+  // p. Every search starts at or before the datagram's first zero byte (a
+  // match never reaches past it, and a token without a suffix ends the
+  // datagram), so that byte limits them all.
+  const void* const zero = std::memchr(data, 0, length);
+  const std::size_t limit =
+      zero == nullptr ? length
+                      : static_cast<std::size_t>(static_cast<const unsigned char*>(zero) - data);
   std::size_t p = 0;
   do {
     if (!prefix_.empty()) {
-      const std::size_t q = Find(prefix_, data, p, length);
-      if (q == length) {
+      const std::size_t q = Find(prefix_, data, p, limit);
+      if (q == limit) {
         return;
       }
       p = q + prefix_.size();
     }
     std::size_t e = length;
     if (!suffix_.empty()) {
-      e = Find(suffix_, data, p, length);
-      if (e == length) {
+      e = Find(suffix_, data, p, limit);
+      if (e == limit) {
         return;
       }
     }
     if (p < e) {
-      emit(std::string(reinterpret_cast<const char*>(data + p), e - p));
+      sink.Token(reinterpret_cast<const char*>(data + p), e - p);
     }
     p = e + suffix_.size();
   } while (p + prefix_.size() + suffix_.size() < length);

@@ -3,6 +3,7 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "driver/DriverErrors.h"
 #include "driver/Protocol_VELT.h"
 #include "protlib/BaseConsole.h"
 #include "protlib/ProtUtilsN.h"
@@ -87,7 +88,8 @@ bool DriverConsole::Connect(const std::vector<std::string>& words, char* output,
     return Failure(output, outputSize, "ERROR: new connect state is missing");
   }
   if (words[1] == "ON" || words[1] == "OFF") {
-    protocol_.setConnectRequested(words[1] == "ON");
+    TokenQueue::Guard held(protocol_.getTokenQueue());
+    protocol_.getRequests().Connect(held, words[1] == "ON");
     return Success(output, outputSize, "OK");
   }
   return Failure(output, outputSize, "ERROR: wrong value");
@@ -97,7 +99,9 @@ bool DriverConsole::SetIpPort(const std::vector<std::string>& words, char* outpu
   if (words.size() < 3) {
     return Failure(output, outputSize, "ERROR: IP and port are missing");
   }
-  protocol_.setRemote(words[1], static_cast<int>(std::strtol(words[2].c_str(), nullptr, 0)));
+  const auto port = static_cast<int>(std::strtol(words[2].c_str(), nullptr, 0));
+  TokenQueue::Guard held(protocol_.getTokenQueue());
+  protocol_.getRequests().SetRemote(held, words[1], port);
   return Success(output, outputSize, "OK");
 }
 
@@ -111,9 +115,8 @@ bool DriverConsole::Put(const std::string& command, char* output, int outputSize
   if (text.empty()) {
     return Failure(output, outputSize, "ERROR: string to send is missing");
   }
-  std::string error;
-  if (!protocol_.sendToken(text, error)) {
-    return Failure(output, outputSize, "ERROR: " + error);
+  if (!protocol_.getAccess().SendToken(text)) {
+    return Failure(output, outputSize, std::string("ERROR: ") + kTokenNotHex.text);
   }
   return Success(output, outputSize, "OK");
 }

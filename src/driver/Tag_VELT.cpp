@@ -1,29 +1,10 @@
 #include "driver/Tag_VELT.h"
 
-#include <algorithm>
-#include <array>
 #include <cstdlib>
 #include <vector>
 
 #include "driver/Protocol_VELT.h"
 #include "protlib/ProtUtilsN.h"
-
-namespace {
-
-// The memory types that stage runtime parameters. "SP_ConnectTimeout" is not
-// offered by the model today but stays in the list, so a model that offers it
-// makes it a runtime parameter at once.
-const std::array<const char*, 15> kRuntimeParameters = {
-    "SP_SocketType",     "SP_RemoteIP",      "SP_RemotePort", "SP_LocalIP",        "SP_LocalPort",
-    "SP_ConnectTimeout", "SP_BroadcastType", "SP_RxPrefix",   "SP_RxSuffix",       "SP_TxPrefix",
-    "SP_TxSuffix",       "SP_Gap",           "SP_HexTokens",  "SP_TokenQueueSize", "SP_Done"};
-
-bool IsRuntimeParameterName(const std::string& name) {
-  return std::any_of(kRuntimeParameters.begin(), kRuntimeParameters.end(),
-                     [&name](const char* candidate) { return name == candidate; });
-}
-
-}  // namespace
 
 Tag_VELT::Tag_VELT(const char* uri_, Protocol_VELT* protocol) : uri(uri_ == nullptr ? "" : uri_) {
   // A false positive: valid is the first field, so as a member initialiser
@@ -70,10 +51,8 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   std::vector<std::string> fields;
   ProtUtilsN::ParseSubstrings(uri, fields, '?');
   if (fields.size() != 3) {
-    // The fixed text of this failure; \x63 is the letter c.
-    return fail("there must be 3 tag spe\x63ification fields");
+    return fail("there must be 3 tag specification fields");
   }
-  const std::string& nodeField = fields[0];
   const std::string& memoryTypeField = fields[1];
   const std::string& dataTypeField = fields[2];
   if (memoryTypeField.empty()) {
@@ -82,7 +61,12 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   if (dataTypeField.empty()) {
     return fail("tavuType field missing");
   }
-  const _VELT::ParamManager& parameters = protocol->getParamManager();
+  return resolveNode(*protocol, fields[0]) && resolveMemoryType(*protocol, memoryTypeField) &&
+         resolveDataType(dataTypeField);
+}
+
+bool Tag_VELT::resolveNode(const Protocol_VELT& protocol, const std::string& nodeField) {
+  const _VELT::ParamManager& parameters = protocol.getParamManager();
   commonParams = parameters.getCommonParams();
   if (commonParams == nullptr) {
     return fail("Can't access protocol common parameters");
@@ -92,19 +76,26 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   if (nodeParams == nullptr) {
     return fail("Can't access protocol node parameters");
   }
-  const MemoryManager& memory = protocol->getMemoryManager();
+  return true;
+}
+
+bool Tag_VELT::resolveMemoryType(const Protocol_VELT& protocol, const std::string& field) {
+  const MemoryManager& memory = protocol.getMemoryManager();
   model = memory.getModel(nodeParams->model);
   if (model == nullptr) {
     return fail("Can't access model");
   }
-  memoryType = memory.getMemoryType(nodeParams->model, memoryTypeField);
+  memoryType = memory.getMemoryType(nodeParams->model, field);
   if (memoryType == nullptr) {
     return fail("Can't access memory type");
   }
+  return true;
+}
+
+bool Tag_VELT::resolveDataType(const std::string& field) {
   int length = 0;
-  if (!ProtUtilsN::GetTAVUType(dataTypeField, varType, itemType, length, conversions) ||
-      length < 0) {
-    return fail(dataTypeField + ": data type unknown");
+  if (!ProtUtilsN::GetTAVUType(field, varType, itemType, length, conversions) || length < 0) {
+    return fail(field + ": data type unknown");
   }
   varLength = length;
   if ((ProtUtilsN::GetTypeFlag(GetVarType()) & memoryType->getTavuTypes()) == 0) {
@@ -113,6 +104,8 @@ bool Tag_VELT::parseTagUrl(Protocol_VELT* protocol) {
   if (ProtUtilsN::GetDataLength(memoryType->getNaturalType()) == 0) {
     return fail("invalid natural data type for this memory type");
   }
-  isRuntimeParameter = IsRuntimeParameterName(memoryType->getName());
+  const std::string name = memoryType->getName();
+  isRuntimeParameter = IsRuntimeParameter(name);
+  memoryRole = ResolveMemory(name);
   return true;
 }

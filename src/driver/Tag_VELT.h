@@ -5,6 +5,7 @@
 
 #include "config/CommonParams.h"
 #include "config/NodeParams.h"
+#include "driver/ChannelMemory.h"
 #include "memory/MemoryType.h"
 #include "memory/Model.h"
 #include "protlib/TagBase.h"
@@ -15,7 +16,9 @@ class Protocol_VELT;
 // constructor resolves every field once against the protocol's parameters and
 // memory model, and from then on the read and write paths use the resolved
 // pointers. A tag always addresses a whole memory type: index and offset are
-// always 0. A tag borrows from its protocol and must not outlive it.
+// always 0. The memory type's role on the channel is resolved with the
+// address too, so reads and writes dispatch on it without comparing names.
+// A tag borrows from its protocol and must not outlive it.
 class Tag_VELT final : public TagBase {
  public:
   Tag_VELT(const char* uri, Protocol_VELT* protocol);
@@ -44,9 +47,17 @@ class Tag_VELT final : public TagBase {
   int getOffset() const { return offset; }
   const _VELT::NodeParams* getNodeParams() const { return nodeParams; }
   bool getIsRuntimeParameter() const { return isRuntimeParameter; }
+  // What the memory type does on the channel, resolved with the address.
+  MemoryRole getMemoryRole() const { return memoryRole; }
 
  private:
   bool parseTagUrl(Protocol_VELT* protocol);
+  // The steps of the parse, in their order: the node and its parameters;
+  // the model and the memory type; the data type, checked against the
+  // memory type, and the memory type's role.
+  bool resolveNode(const Protocol_VELT& protocol, const std::string& nodeField);
+  bool resolveMemoryType(const Protocol_VELT& protocol, const std::string& field);
+  bool resolveDataType(const std::string& field);
   bool fail(const std::string& text) const;
 
   std::int32_t valid = 0;
@@ -62,4 +73,5 @@ class Tag_VELT final : public TagBase {
   const _VELT::CommonParams* commonParams = nullptr;
   const Model* model = nullptr;
   bool isRuntimeParameter = false;
+  MemoryRole memoryRole;
 };

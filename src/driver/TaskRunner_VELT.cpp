@@ -12,3 +12,8 @@ void TaskRunner_VELT::Task() {
     multiTask->Sleep(0);
   }
 }
+
+bool TaskRunner_VELT::stopRequested() const {
+  const ITask* const task = workerTask.load();
+  return task != nullptr && task->IsStopping() != 0;
+}

@@ -18,6 +18,8 @@ class TaskRunner_VELT final : public MultiTaskN::TaskRunner {
   void Task() override;
 
   IMultiTask2* getMultiTask() const { return multiTask; }
+  // True once the host asked the running task to end.
+  bool stopRequested() const;
   ITask* getWorkerTask() const { return workerTask.load(); }
   void setWorkerTask(ITask* task) { workerTask.store(task); }
 

@@ -1,5 +1,6 @@
 #include "AllocationCounter.h"
 
+#include <atomic>
 #include <cstdlib>
 #include <new>
 
@@ -8,10 +9,20 @@ namespace {
 // Per thread, so a test's count is not disturbed by other threads.
 thread_local std::uint64_t threadAllocations = 0;
 
+std::atomic<std::uint64_t>& ProcessAllocations() {
+  static std::atomic<std::uint64_t> count{0};
+  return count;
+}
+
+void Count() {
+  ++threadAllocations;
+  ProcessAllocations().fetch_add(1, std::memory_order_relaxed);
+}
+
 // The allocation loop the language prescribes: retry through the new
 // handler until memory comes or there is no handler left.
 void* Allocate(std::size_t size) {
-  ++threadAllocations;
+  Count();
   const std::size_t bytes = size == 0 ? 1 : size;
   for (;;) {
     if (void* memory = std::malloc(bytes)) {
@@ -26,7 +37,7 @@ void* Allocate(std::size_t size) {
 }
 
 void* AllocateAligned(std::size_t size, std::align_val_t alignment) {
-  ++threadAllocations;
+  Count();
   const std::size_t bytes = size == 0 ? 1 : size;
   auto align = static_cast<std::size_t>(alignment);
   align = align < sizeof(void*) ? sizeof(void*) : align;
@@ -48,6 +59,10 @@ void* AllocateAligned(std::size_t size, std::align_val_t alignment) {
 AllocationCounter::AllocationCounter() : start(threadAllocations) {}
 
 std::uint64_t AllocationCounter::count() const { return threadAllocations - start; }
+
+std::uint64_t AllocationCounter::processCount() {
+  return ProcessAllocations().load(std::memory_order_relaxed);
+}
 
 void* operator new(std::size_t size) { return Allocate(size); }
 void* operator new[](std::size_t size) { return Allocate(size); }

@@ -18,6 +18,10 @@ class AllocationCounter {
 
   // Allocations made on this thread since construction.
   std::uint64_t count() const;
+  // Allocations made by every thread of the program since it started, a
+  // loaded plug-in's included (the replacement functions stand in for the
+  // library's everywhere).
+  static std::uint64_t processCount();
 
  private:
   std::uint64_t start;

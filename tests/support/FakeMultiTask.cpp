@@ -4,8 +4,14 @@
 
 class FakeMultiTask::Mutex final : public IMutex {
  public:
-  void Lock() override { mutex_.lock(); }
-  void Unlock() override { mutex_.unlock(); }
+  void Lock() override {
+    mutex_.lock();
+    ++HeldByThisThread();
+  }
+  void Unlock() override {
+    --HeldByThisThread();
+    mutex_.unlock();
+  }
 
  private:
   std::mutex mutex_;
@@ -36,6 +42,11 @@ class FakeMultiTask::Task final : public ITask {
   std::atomic<bool> stopping_{false};
   std::thread thread_;
 };
+
+int& FakeMultiTask::HeldByThisThread() {
+  thread_local int held = 0;
+  return held;
+}
 
 FakeMultiTask::FakeMultiTask() = default;
 

@@ -44,6 +44,8 @@ class FakeMultiTask final : public IMultiTask2 {
 
   // Records.
   int LiveMutexes() const;
+  // How many of the fake's mutexes the calling thread holds now.
+  static int MutexesHeldHere() { return HeldByThisThread(); }
   int LiveTasks() const;
   int TasksCreated() const { return tasksCreated_; }
   int LastTaskSetting() const { return lastSetting_; }
@@ -57,6 +59,7 @@ class FakeMultiTask final : public IMultiTask2 {
 
  private:
   class Mutex;
+  static int& HeldByThisThread();
   class Task;
 
   mutable std::mutex lock_;

@@ -27,21 +27,30 @@ IInterface* MemoryStorage::ConvertTo(const char* name) {
 }
 
 void MemoryStorage::SetStringValue(const char* section, const char* name, const char* value) {
-  const std::lock_guard<std::mutex> lock(mutex_);
-  record("SetStringValue", section, name, value == nullptr ? "(null)" : value);
-  store(Text(section), Text(name), Stored::OfText(Text(value)));
+  {
+    const std::lock_guard<std::mutex> lock(mutex_);
+    record("SetStringValue", section, name, value == nullptr ? "(null)" : value);
+    store(Text(section), Text(name), Stored::OfText(Text(value)));
+  }
+  written(name);
 }
 
 void MemoryStorage::SetBoolValue(const char* section, const char* name, bool value) {
-  const std::lock_guard<std::mutex> lock(mutex_);
-  record("SetBoolValue", section, name, FlagText(value));
-  store(Text(section), Text(name), Stored::OfFlag(value));
+  {
+    const std::lock_guard<std::mutex> lock(mutex_);
+    record("SetBoolValue", section, name, FlagText(value));
+    store(Text(section), Text(name), Stored::OfFlag(value));
+  }
+  written(name);
 }
 
 void MemoryStorage::SetIntValue(const char* section, const char* name, int value) {
-  const std::lock_guard<std::mutex> lock(mutex_);
-  record("SetIntValue", section, name, std::to_string(value));
-  store(Text(section), Text(name), Stored::OfNumber(value));
+  {
+    const std::lock_guard<std::mutex> lock(mutex_);
+    record("SetIntValue", section, name, std::to_string(value));
+    store(Text(section), Text(name), Stored::OfNumber(value));
+  }
+  written(name);
 }
 
 const char* MemoryStorage::GetStringValue(const char* section, const char* name) {
@@ -185,6 +194,22 @@ std::string MemoryStorage::Text(const char* value) {
 void MemoryStorage::record(const char* operation, const char* section, const char* name,
                            std::string value) {
   log_.emplace_back(operation, Text(section), Text(name), std::move(value));
+}
+
+void MemoryStorage::onWrite(std::function<void(const std::string& name)> hook) {
+  const std::lock_guard<std::mutex> lock(mutex_);
+  onWrite_ = std::move(hook);
+}
+
+void MemoryStorage::written(const char* name) {
+  std::function<void(const std::string& name)> hook;
+  {
+    const std::lock_guard<std::mutex> lock(mutex_);
+    hook = onWrite_;
+  }
+  if (hook) {
+    hook(Text(name));
+  }
 }
 
 const MemoryStorage::Stored* MemoryStorage::lookup(const char* section, const char* name) const {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <map>
 #include <mutex>
 #include <optional>
@@ -50,6 +51,9 @@ class MemoryStorage final : public IPermanentStorage2 {
   // While set, every text read fails: GetStringValueInto answers 0 and
   // GetStringValue answers null.
   void failStringReads(bool fail);
+  // Called after each value is written, outside the storage's lock, on the
+  // writing thread (as a slow store would keep its caller meanwhile).
+  void onWrite(std::function<void(const std::string& name)> hook);
 
   // What is stored (not logged). Empty when absent or stored with another
   // type.
@@ -83,6 +87,8 @@ class MemoryStorage final : public IPermanentStorage2 {
 
   static std::string Text(const char* value);
   void record(const char* operation, const char* section, const char* name, std::string value);
+  // Runs the write hook, if any, for name.
+  void written(const char* name);
   const Stored* lookup(const char* section, const char* name) const;
   void store(const std::string& section, const std::string& name, Stored value);
   // The member of the value stored under section and name, when it is of
@@ -96,6 +102,7 @@ class MemoryStorage final : public IPermanentStorage2 {
   std::map<Key, Stored> values_;
   std::vector<StorageCall> log_;
   bool failStringReads_ = false;
+  std::function<void(const std::string& name)> onWrite_;
   // GetStringValue's answer stays valid until the calling thread's next call,
   // so each thread gets its own text.
   std::map<std::thread::id, std::string> answered_;

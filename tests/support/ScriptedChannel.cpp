@@ -20,5 +20,15 @@ ScriptedChannel::~ScriptedChannel() {
 
 void ScriptedChannel::Receive(const std::string& token) {
   TokenQueue::Guard held(protocol_->getTokenQueue());
-  protocol_->addToken(held, token);
+  held.addToken(token);
+}
+
+ScriptedSocket& ScriptedChannel::Connect() {
+  protocol_->Task();
+  std::string reply(64, '\0');
+  protocol_->DoCommand("connect ON", reply.data(), static_cast<int>(reply.size()));
+  protocol_->Task();
+  ScriptedSocket& socket = *sockets_.Last();
+  socket.KeepRecords(false);
+  return socket;
 }

@@ -36,6 +36,11 @@ class ScriptedChannel {
   // Queues a received token as the worker does (hex text when hex tokens
   // are on, dropping the oldest at the bound).
   void Receive(const std::string& token);
+  // Connects the started channel as a host would: one pass (the worker
+  // makes its socket), connect switched on, one more pass (it connects).
+  // Answers the channel's socket, which then keeps no records, so long runs
+  // on it do not allocate.
+  ScriptedSocket& Connect();
 
  private:
   FakeMultiTask tasks_;

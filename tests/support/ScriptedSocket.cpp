@@ -5,7 +5,9 @@
 
 int ScriptedSocket::Connect(const char* ip, unsigned short port) {
   const std::lock_guard<std::mutex> guard(lock_);
-  connects_.push_back({ip == nullptr ? std::string() : std::string(ip), port});
+  if (keepRecords_) {
+    connects_.push_back({ip == nullptr ? std::string() : std::string(ip), port});
+  }
   if (connectResults_.empty()) {
     return 0;
   }
@@ -20,8 +22,24 @@ int ScriptedSocket::IsBroken() {
 }
 
 int ScriptedSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMilliseconds) {
+  {
+    const std::lock_guard<std::mutex> guard(lock_);
+    if (keepRecords_) {
+      receives_.push_back({maxLength, timeoutMilliseconds});
+    }
+  }
+  for (;;) {
+    std::function<void()> action;
+    const int result = Serve(buffer, maxLength, action);
+    if (!action) {
+      return result;
+    }
+    action();
+  }
+}
+
+int ScriptedSocket::Serve(unsigned char* buffer, int maxLength, std::function<void()>& action) {
   const std::lock_guard<std::mutex> guard(lock_);
-  receives_.push_back({maxLength, timeoutMilliseconds});
   if (script_.empty() || maxLength < 1) {
     return 0;
   }
@@ -33,6 +51,10 @@ int ScriptedSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMil
     case Step::Error:
       script_.pop_front();
       return -1;
+    case Step::Action:
+      action = std::move(step.action);
+      script_.pop_front();
+      return 0;
     case Step::Datagram: {
       const std::size_t n = std::min(step.bytes.size(), static_cast<std::size_t>(maxLength));
       std::memcpy(buffer, step.bytes.data(), n);
@@ -40,11 +62,15 @@ int ScriptedSocket::Receive(unsigned char* buffer, int maxLength, int timeoutMil
       return static_cast<int>(n);
     }
     case Step::Stream: {
-      const std::size_t n = std::min(step.bytes.size(), static_cast<std::size_t>(maxLength));
-      std::memcpy(buffer, step.bytes.data(), n);
-      step.bytes.erase(0, n);
-      if (step.bytes.empty()) {
-        script_.pop_front();
+      const std::size_t n =
+          std::min(step.bytes.size() - step.offset, static_cast<std::size_t>(maxLength));
+      std::memcpy(buffer, step.bytes.data() + step.offset, n);
+      step.offset += n;
+      if (step.offset == step.bytes.size()) {
+        step.offset = 0;
+        if (--step.times == 0) {
+          script_.pop_front();
+        }
       }
       return static_cast<int>(n);
     }
@@ -67,30 +93,39 @@ int ScriptedSocket::GetAdapterInfo(unsigned int ip, unsigned int* address, unsig
 
 int ScriptedSocket::Send(const unsigned char* data, int length) {
   const std::lock_guard<std::mutex> guard(lock_);
-  sends_.emplace_back(reinterpret_cast<const char*>(data), static_cast<std::size_t>(length));
+  if (keepRecords_) {
+    sends_.emplace_back(reinterpret_cast<const char*>(data), static_cast<std::size_t>(length));
+  }
   return length;
 }
 
 void ScriptedSocket::AddDatagram(const std::string& bytes) {
   const std::lock_guard<std::mutex> guard(lock_);
-  script_.push_back({Step::Datagram, bytes});
+  script_.push_back({Step::Datagram, bytes, 1, 0, nullptr});
 }
 
-void ScriptedSocket::AddStream(const std::string& bytes) {
+void ScriptedSocket::AddStream(const std::string& bytes) { AddRepeatedStream(bytes, 1); }
+
+void ScriptedSocket::AddRepeatedStream(const std::string& bytes, std::size_t times) {
   const std::lock_guard<std::mutex> guard(lock_);
-  if (!bytes.empty()) {
-    script_.push_back({Step::Stream, bytes});
+  if (!bytes.empty() && times != 0) {
+    script_.push_back({Step::Stream, bytes, times, 0, nullptr});
   }
+}
+
+void ScriptedSocket::AddAction(std::function<void()> action) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  script_.push_back({Step::Action, {}, 1, 0, std::move(action)});
 }
 
 void ScriptedSocket::AddTimeout() {
   const std::lock_guard<std::mutex> guard(lock_);
-  script_.push_back({Step::Timeout, {}});
+  script_.push_back({Step::Timeout, {}, 1, 0, nullptr});
 }
 
 void ScriptedSocket::AddError() {
   const std::lock_guard<std::mutex> guard(lock_);
-  script_.push_back({Step::Error, {}});
+  script_.push_back({Step::Error, {}, 1, 0, nullptr});
 }
 
 void ScriptedSocket::AddConnectResults(int result, int count) {
@@ -110,6 +145,11 @@ void ScriptedSocket::SetAdapter(unsigned int address, unsigned int mask) {
   hasAdapter_ = true;
   adapterAddress_ = address;
   adapterMask_ = mask;
+}
+
+void ScriptedSocket::KeepRecords(bool keep) {
+  const std::lock_guard<std::mutex> guard(lock_);
+  keepRecords_ = keep;
 }
 
 std::size_t ScriptedSocket::Pending() const {

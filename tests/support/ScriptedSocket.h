@@ -1,6 +1,7 @@
 #pragma once
 
 #include <deque>
+#include <functional>
 #include <mutex>
 #include <string>
 #include <vector>
@@ -9,10 +10,14 @@
 
 // A socket that plays a script. Receive consumes the script from the front:
 // a datagram step is delivered whole by one call (cut to the caller's maximum),
-// a stream step is handed out up to the caller's maximum per call, a time-out
-// step answers 0 once and an error step -1 once; an empty script answers 0.
+// a stream step is handed out up to the caller's maximum per call (a repeated
+// one as often as asked, without copying it again), a time-out step answers 0
+// once and an error step -1 once; an action step runs its function when a
+// receive reaches it (as if something happened while the caller waited) and
+// the receive goes on with the next step; an empty script answers 0.
 // Connect answers the queued results (0 once the queue is empty); IsBroken
-// answers the broken flag. Every call is recorded.
+// answers the broken flag. Every call is recorded unless records are turned
+// off (which keeps long runs from allocating).
 class ScriptedSocket final : public ISocket {
  public:
   struct ConnectCall {
@@ -36,12 +41,16 @@ class ScriptedSocket final : public ISocket {
   // Script.
   void AddDatagram(const std::string& bytes);
   void AddStream(const std::string& bytes);
+  // The bytes, received times times in a row.
+  void AddRepeatedStream(const std::string& bytes, std::size_t times);
+  void AddAction(std::function<void()> action);
   void AddTimeout();
   void AddError();
   void AddConnectResults(int result, int count = 1);
   void SetBroken(bool broken);
   // The adapter the look-up answers for any address; failing when not set.
   void SetAdapter(unsigned int address, unsigned int mask);
+  void KeepRecords(bool keep);
   // How many script steps are left.
   std::size_t Pending() const;
 
@@ -55,9 +64,16 @@ class ScriptedSocket final : public ISocket {
 
  private:
   struct Step {
-    enum Kind { Datagram, Stream, Timeout, Error } kind;
+    enum Kind { Datagram, Stream, Timeout, Error, Action } kind;
     std::string bytes;
+    std::size_t times = 1;
+    std::size_t offset = 0;
+    std::function<void()> action;
   };
+
+  // Serves the front step under the lock; an action step is handed back to
+  // run outside it.
+  int Serve(unsigned char* buffer, int maxLength, std::function<void()>& action);
 
   mutable std::mutex lock_;
   unsigned short localPort_;
@@ -65,6 +81,7 @@ class ScriptedSocket final : public ISocket {
   std::deque<Step> script_;
   std::deque<int> connectResults_;
   bool broken_ = false;
+  bool keepRecords_ = true;
   bool hasAdapter_ = false;
   unsigned int adapterAddress_ = 0;
   unsigned int adapterMask_ = 0;

@@ -278,6 +278,39 @@ TEST_F(GroupParameterReplacerTest, ApplyWithoutPersistWritesNothingButUpdatesThe
   EXPECT_EQ(storage.calls(), Calls{});
 }
 
+TEST_F(GroupParameterReplacerTest, ApplyInTwoStepsWritesStorageOnlyWhenPersisted) {
+  staging.set("tx_suffix", -1, "0D0A");
+  staging.set("gap", 2, 9);
+  staging.set("gap", -1, 40);
+
+  const GroupParameterReplacer::Applied applied = staging.apply(live, -1);
+
+  EXPECT_EQ(storage.calls(), Calls{});
+  ASSERT_EQ(applied.size(), 2U);
+  EXPECT_EQ(applied[0].first, "gap");
+  EXPECT_EQ(applied[0].second.intValue, 40);
+  EXPECT_EQ(applied[1].first, "tx_suffix");
+  EXPECT_EQ(applied[1].second.stringValue, "0D0A");
+  EXPECT_EQ(Keys(live.entries()), (std::vector<std::string>{"gap", "tx_suffix"}));
+
+  GroupParameterReplacer::persist(live, applied);
+  EXPECT_EQ(storage.calls(), (Calls{{"SetIntValue", "P1", "gap", "40"},
+                                    {"SetStringValue", "P1", "tx_suffix", "0D0A"}}));
+}
+
+TEST_F(GroupParameterReplacerTest, LiveValuesCanBeReadWhileTheyAreWrittenToStorage) {
+  staging.set("gap", -1, 40);
+  int seen = 0;
+  storage.onWrite([this, &seen](const std::string& /*name*/) {
+    // Another thread reads the live set while its value is being stored.
+    std::thread reader([this, &seen] { live.get("gap", -1, 0, seen); });
+    reader.join();
+  });
+  staging.activate(live, -1, true);
+  storage.onWrite(nullptr);
+  EXPECT_EQ(seen, 40);
+}
+
 TEST_F(GroupParameterReplacerTest, ApplyReplacesAValueTheLiveSetAlreadyHeld) {
   int gap = 0;
   live.get("gap", -1, 100, gap);

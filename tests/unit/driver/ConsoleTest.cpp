@@ -29,7 +29,7 @@ class ConsoleTest : public DriverFixture {
  protected:
   void Queue(const std::string& token) {
     TokenQueue::Guard held(protocol->getTokenQueue());
-    protocol->addToken(held, token);
+    held.addToken(token);
   }
 };
 
@@ -73,8 +73,8 @@ TEST_F(ConsoleTest, SetIpPortChangesTheWorkingRemote) {
   bool ok = false;
   EXPECT_EQ(Command("set_ip_port 10.0.0.9 010", &ok), "OK");
   EXPECT_TRUE(ok);
-  EXPECT_EQ(protocol->getSettings().remoteIp, "10.0.0.9");
-  EXPECT_EQ(protocol->getSettings().remotePort, 8);
+  EXPECT_EQ(protocol->getSettings().text(Setting::RemoteIp), "10.0.0.9");
+  EXPECT_EQ(protocol->getSettings().number(Setting::RemotePort), 8);
   EXPECT_EQ(storage.writes(), std::vector<StorageCall>{});
   EXPECT_EQ(Command("set_ip_port 10.0.0.9", &ok), "ERROR: IP and port are missing");
   EXPECT_FALSE(ok);

@@ -270,8 +270,8 @@ TEST_F(ProtocolLifecycleTest, StartReadsTheThirteenLiveNamesInOrder) {
                                              "local_ip_address", "local_port", "broadcast_type",
                                              "rx_prefix", "rx_suffix", "gap", "tx_prefix",
                                              "tx_suffix", "hex_tokens", "token_queue_size"}));
-  EXPECT_EQ(protocol->getSettings().remotePort, 7777);
-  EXPECT_EQ(protocol->getSettings().remoteIp, "127.0.0.1");
+  EXPECT_EQ(protocol->getSettings().number(Setting::RemotePort), 7777);
+  EXPECT_EQ(protocol->getSettings().text(Setting::RemoteIp), "127.0.0.1");
 }
 
 TEST_F(ProtocolLifecycleTest, StorageIsReadOnlyAtTheFirstStart) {
@@ -287,7 +287,7 @@ TEST_F(ProtocolLifecycleTest, StoredValuesLiveUnderTheInstanceIdentity) {
   Protocol_VELT& p = Create(kUdpConfig);
   p.SetIdent("panel-7");
   p.Start();
-  EXPECT_EQ(p.getSettings().remoteIp, "127.0.0.9");
+  EXPECT_EQ(p.getSettings().text(Setting::RemoteIp), "127.0.0.9");
 }
 
 TEST_F(ProtocolLifecycleTest, LaterConfigDoesNotChangeTheLiveValuesOfTheSameChannel) {
@@ -296,10 +296,10 @@ TEST_F(ProtocolLifecycleTest, LaterConfigDoesNotChangeTheLiveValuesOfTheSameChan
   ASSERT_TRUE(
       p.Config("CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.5 remotePort=9 gap=40"));
   p.Start();
-  EXPECT_EQ(p.getSettings().socketType, "UDP");
-  EXPECT_EQ(p.getSettings().remoteIp, "127.0.0.1");
-  EXPECT_EQ(p.getSettings().remotePort, 5000);
-  EXPECT_EQ(p.getSettings().gap, 0);
+  EXPECT_EQ(p.getSettings().text(Setting::SocketType), "UDP");
+  EXPECT_EQ(p.getSettings().text(Setting::RemoteIp), "127.0.0.1");
+  EXPECT_EQ(p.getSettings().number(Setting::RemotePort), 5000);
+  EXPECT_EQ(p.getSettings().number(Setting::Gap), 0);
 }
 
 TEST_F(ProtocolLifecycleTest, NewChannelStartsFromTheNewConfiguration) {
@@ -307,9 +307,9 @@ TEST_F(ProtocolLifecycleTest, NewChannelStartsFromTheNewConfiguration) {
   Destroy();
   Protocol_VELT& p =
       Started("CfgVer=1 model=1 socketType=TCP remoteIpAddress=127.0.0.5 remotePort=9 gap=40");
-  EXPECT_EQ(p.getSettings().socketType, "TCP");
-  EXPECT_EQ(p.getSettings().remoteIp, "127.0.0.5");
-  EXPECT_EQ(p.getSettings().gap, 40);
+  EXPECT_EQ(p.getSettings().text(Setting::SocketType), "TCP");
+  EXPECT_EQ(p.getSettings().text(Setting::RemoteIp), "127.0.0.5");
+  EXPECT_EQ(p.getSettings().number(Setting::Gap), 40);
 }
 
 TEST_F(ProtocolLifecycleTest, DestroyingARunningChannelStopsItFirst) {

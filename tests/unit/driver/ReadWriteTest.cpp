@@ -1,5 +1,8 @@
+#include <chrono>
 #include <cstring>
+#include <future>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "DriverFixture.h"
@@ -10,7 +13,7 @@ class ReadWriteTest : public DriverFixture {
  protected:
   void Queue(const std::string& token) {
     TokenQueue::Guard held(protocol->getTokenQueue());
-    protocol->addToken(held, token);
+    held.addToken(token);
   }
   std::size_t Queued() {
     TokenQueue::Guard held(protocol->getTokenQueue());
@@ -147,7 +150,7 @@ TEST_F(ReadWriteTest, StagedValueReadsBackBeforeItIsApplied) {
   ITag* const ip = Tag("?SP_RemoteIP?string-16");
   EXPECT_TRUE(WriteText(ip, "127.0.0.77"));
   EXPECT_EQ(ReadText(ip), "127.0.0.77");
-  EXPECT_EQ(protocol->getSettings().remoteIp, "127.0.0.1");
+  EXPECT_EQ(protocol->getSettings().text(Setting::RemoteIp), "127.0.0.1");
 }
 
 TEST_F(ReadWriteTest, StagedNumberAndFlagReadBackBeforeTheyAreApplied) {
@@ -158,8 +161,8 @@ TEST_F(ReadWriteTest, StagedNumberAndFlagReadBackBeforeTheyAreApplied) {
   EXPECT_TRUE(WriteBool(hex, true));
   EXPECT_EQ(ReadInt(gap), 100);
   EXPECT_TRUE(ReadBool(hex));
-  EXPECT_EQ(protocol->getSettings().gap, 0);
-  EXPECT_FALSE(protocol->getSettings().hexTokens);
+  EXPECT_EQ(protocol->getSettings().number(Setting::Gap), 0);
+  EXPECT_FALSE(protocol->getSettings().flag(Setting::HexTokens));
 }
 
 TEST_F(ReadWriteTest, PortReadsTheLowTwoBytesOfTheValue) {
@@ -288,7 +291,7 @@ TEST_F(ReadWriteTest, AppliedGapTakesEffectWithoutANewSocket) {
   Connected(kTcpConfig);
   EXPECT_TRUE(WriteInt(Tag("?SP_Gap?unsignedInt"), 100));
   EXPECT_TRUE(WriteBool(Tag("?SP_Done?boolean"), false));
-  EXPECT_EQ(protocol->getSettings().gap, 100);
+  EXPECT_EQ(protocol->getSettings().number(Setting::Gap), 100);
   sockets.ClearLog();
   Sock().AddStream("x");
   Pass();
@@ -309,7 +312,21 @@ TEST_F(ReadWriteTest, ApplyPersistsUnderTheInstanceAndKeepsTheStagedValues) {
   storage.clearCalls();
   EXPECT_TRUE(WriteBool(done, true));
   EXPECT_EQ(storage.writes().size(), 2U);
-  EXPECT_EQ(protocol->getSettings().txPrefix, "0A");
+  EXPECT_EQ(protocol->getSettings().text(Setting::TxPrefix), "0A");
+}
+
+TEST_F(ReadWriteTest, ApplyWritesStorageWhileHoldingTheChannelLock) {
+  Started(kUdpConfig);
+  EXPECT_TRUE(WriteInt(Tag("?SP_Gap?unsignedInt"), 30));
+  EXPECT_TRUE(WriteText(Tag("?SP_TxPrefix?string-8"), "0A"));
+  // The whole apply happens under queueLock, storage writes included: a host
+  // can tell the values of one apply by the lock held while they arrive.
+  std::vector<int> held;
+  storage.onWrite([&](const std::string& /*name*/) { held.push_back(tasks.MutexesHeldHere()); });
+  EXPECT_TRUE(WriteBool(Tag("?SP_Done?boolean"), true));
+  storage.onWrite(nullptr);
+  EXPECT_EQ(held, (std::vector<int>{1, 1}));
+  EXPECT_EQ(tasks.MutexesHeldHere(), 0);
 }
 
 TEST_F(ReadWriteTest, QueueBoundWrittenAtRunTimeOfZeroKeepsTheNewestToken) {

@@ -1,4 +1,6 @@
+#include <chrono>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "DriverFixture.h"
@@ -157,17 +159,19 @@ TEST_F(WorkerTest, TcpFramedStreamSkipsBytesBeforeThePrefix) {
   EXPECT_EQ(Drain(), Tokens{"AB"});
 }
 
-TEST_F(WorkerTest, TcpReceivesOneByteAtATimeWithTheGap) {
+TEST_F(WorkerTest, TcpReceivesUpToTheBufferWithTheGap) {
   Connected(WithMarkers(kTcpConfig, "02", "03") + " gap=250");
   Sock().AddStream(Bytes("024103"));
   Pass();
-  // One receive of the connecting pass, three of this one.
+  // One receive of the connecting pass, one of this one, which takes the
+  // whole frame at once.
   const auto receives = Sock().Receives();
-  ASSERT_EQ(receives.size(), 4U);
+  ASSERT_EQ(receives.size(), 2U);
   for (const auto& receive : receives) {
-    EXPECT_EQ(receive.maxLength, 1);
+    EXPECT_EQ(receive.maxLength, 1536);
     EXPECT_EQ(receive.timeout, 250);
   }
+  EXPECT_EQ(Drain(), Tokens{"A"});
 }
 
 TEST_F(WorkerTest, TcpGapZeroMeansFiveHundredMilliseconds) {
@@ -454,4 +458,149 @@ TEST_F(WorkerTest, ReceiveErrorEndsThePassLikeATimeout) {
   EXPECT_EQ(Drain(), Tokens{});
   Pass();
   EXPECT_EQ(Drain(), Tokens{"after"});
+}
+
+TEST_F(WorkerTest, TcpBytesAfterATokenWaitForTheNextPass) {
+  Connected(WithMarkers(kTcpConfig, "02", "03"));
+  Sock().AddStream(Bytes("55024103") + Bytes("550242") + Bytes("03"));
+  Sock().AddStream(Bytes("024303"));
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"A"});
+  // The next pass starts afresh on the bytes after the token: the leading
+  // 55 is skipped and the frame completes with the next receive.
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"B"});
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"C"});
+  EXPECT_EQ(Sock().Receives().size(), 3U);
+}
+
+TEST_F(WorkerTest, TcpConnectionIsNotAskedWhileReceivedBytesWaitToBeFramed) {
+  Connected(WithMarkers(kTcpConfig, "02", "03"));
+  Sock().AddStream(Bytes("024103024203"));
+  Pass();
+  Sock().SetBroken(true);
+  sockets.ClearLog();
+  // The bytes that arrived before the connection broke come first.
+  Pass();
+  EXPECT_EQ(Drain(), (Tokens{"A", "B"}));
+  EXPECT_EQ(sockets.Log(), std::vector<std::string>{});
+  Pass();
+  EXPECT_EQ(sockets.Log(), (std::vector<std::string>{"delete #2 0", "create 0 1 0 -> #3"}));
+}
+
+TEST_F(WorkerTest, UdpPassEndsBeforeItsNextReceiveWhenARequestIsMade) {
+  Connected(kUdpConfig);
+  const std::size_t before = Sock().Receives().size();
+  Sock().AddDatagram("1");
+  // Connect is switched off while the worker waits for its second datagram.
+  Sock().AddAction([this] { Command("connect OFF"); });
+  Sock().AddDatagram("2");
+  Sock().AddDatagram("3");
+  Pass();
+  EXPECT_EQ(Sock().Receives().size() - before, 2U);
+  EXPECT_EQ(Sock().Pending(), 1U);
+  sockets.ClearLog();
+  Pass();
+  EXPECT_FALSE(protocol->isConnected());
+  EXPECT_EQ(sockets.Log(), (std::vector<std::string>{"delete #2 0", "create 6000 0 0 -> #3"}));
+  // Nothing received was lost to the request.
+  EXPECT_EQ(Drain(), (Tokens{"1", "2"}));
+}
+
+TEST_F(WorkerTest, TcpPassEndedForARequestGoesOnWhereItStopped) {
+  Connected(WithMarkers(kTcpConfig, "02", ""));
+  Sock().AddStream(Bytes("0241"));
+  Sock().AddAction([this] {
+    EXPECT_TRUE(WriteInt(Tag("?SP_Gap?unsignedInt"), 100));
+    EXPECT_TRUE(WriteBool(Tag("?SP_Done?boolean"), true));
+  });
+  Sock().AddStream(Bytes("4202"));
+  Sock().AddStream(Bytes("43"));
+  Sock().AddTimeout();
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"AB"});
+  sockets.ClearLog();
+  // The frame opened by the second prefix goes on in the next pass, which
+  // receives with the applied gap.
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"C"});
+  EXPECT_EQ(sockets.Log(), std::vector<std::string>{});
+  EXPECT_EQ(Sock().Receives().back().timeout, 100);
+}
+
+TEST_F(WorkerTest, TcpAppliedMarkersTakeEffectUnderSteadyTraffic) {
+  Connected(WithMarkers(kTcpConfig, "02", ""));
+  Sock().AddStream(Bytes("024102420243"));
+  Sock().AddAction([this] {
+    EXPECT_TRUE(WriteText(Tag("?SP_RxPrefix?string-8"), "03"));
+    EXPECT_TRUE(WriteBool(Tag("?SP_Done?boolean"), true));
+  });
+  Sock().AddStream(Bytes("44"));
+  Sock().AddStream(Bytes("0345034603"));
+  Sock().AddTimeout();
+  Pass(2);
+  // The apply emptied the queue of A and B; the frame open under the old
+  // prefix was dropped with it, and the new prefix frames what follows.
+  EXPECT_EQ(Drain(), (Tokens{"E", "F"}));
+}
+
+TEST_F(WorkerTest, TcpConnectOffFramesTheBytesAlreadyReceivedFirst) {
+  Connected(WithMarkers(kTcpConfig, "02", "03"));
+  Sock().AddStream(Bytes("024103024203024403") + Bytes("0245"));
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"A"});
+  Command("connect OFF");
+  sockets.ClearLog();
+  Pass();
+  EXPECT_EQ(Drain(), (Tokens{"B", "D"}));
+  EXPECT_EQ(sockets.Log(), (std::vector<std::string>{"delete #2 0", "create 0 1 0 -> #3"}));
+  // The open frame went with the old socket: the new one starts afresh.
+  Command("connect ON");
+  Sock().AddStream(Bytes("4603") + Bytes("024703"));
+  Pass(2);
+  EXPECT_EQ(Drain(), Tokens{"G"});
+}
+
+TEST_F(WorkerTest, StopFramesTheBytesAlreadyReceived) {
+  Connected(WithMarkers(kTcpConfig, "02", "03"));
+  Sock().AddStream(Bytes("024103024203"));
+  Pass();
+  protocol->Stop();
+  EXPECT_EQ(Drain(), (Tokens{"A", "B"}));
+}
+
+TEST_F(WorkerTest, StopEndsAPassUnderContinuousTraffic) {
+  // A prefix-only stream without a silence never ends a pass by itself; the
+  // worker must still end when the host stops it, long before the stream
+  // runs out.
+  constexpr std::size_t kRepeats = 1000000000;
+  tasks.RunTasksOnThreads(true);
+  sockets.OnCreate([](ScriptedSocket& socket) {
+    socket.KeepRecords(false);
+    socket.AddRepeatedStream(DriverFixture::Bytes("0241"), kRepeats);
+  });
+  Started(WithMarkers(kTcpConfig, "02", ""));
+  Command("connect ON");
+  for (int i = 0; i < 5000 && Command("tokens_available") == "0"; ++i) {
+    std::this_thread::sleep_for(std::chrono::milliseconds(1));
+  }
+  ASSERT_NE(Command("tokens_available"), "0");
+  protocol->Stop();
+  EXPECT_EQ(Sock().Pending(), 1U);
+}
+
+TEST_F(WorkerTest, DatagramSocketFramedAsAStreamKeepsOneByteOfEachDatagram) {
+  // A socket type other than exactly "UDP" or "TCP" makes a UDP socket
+  // framed as a stream, one byte per receive.
+  Connected("CfgVer=1 model=1 socketType=udp remoteIpAddress=127.0.0.1 remotePort=5000");
+  EXPECT_EQ(Sock().Tcp(), 0);
+  Sock().AddDatagram("hello");
+  Sock().AddDatagram("xy");
+  Sock().AddTimeout();
+  Pass();
+  EXPECT_EQ(Drain(), Tokens{"hx"});
+  for (const auto& receive : Sock().Receives()) {
+    EXPECT_EQ(receive.maxLength, 1);
+  }
 }

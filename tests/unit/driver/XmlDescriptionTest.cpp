@@ -13,6 +13,7 @@
 #include "MiniXml.h"
 #include "config/ParamManager.h"
 #include "driver/Protocol_VELT.h"
+#include "driver/SettingsTable.h"
 #include "protlib/ProtUtilsN.h"
 
 namespace {
@@ -807,5 +808,60 @@ TEST_F(DescriptionAndCode, SocketTypesListedAreTheOnesTheDriverAccepts) {
   ASSERT_EQ(Texts(entries), (std::vector<std::string>{"UDP", "TCP"}));
   const std::vector<const XmlElement*> broadcast = Parameter("broadcastType").findAll("list_entry");
   ASSERT_EQ(Texts(broadcast), (std::vector<std::string>{"Global", "Local"}));
+}
+TEST_F(DescriptionAndCode, SettingsTableMatchesTheParametersAndMemoryTypes) {
+  // Each runtime setting has its configuration parameter, in Start's order
+  // among the parameters, with a type of its kind, and its memory type,
+  // typed after its kind too.
+  std::vector<std::string> keys;
+  for (const XmlElement* parameter : root().findAll("parameters/parameter")) {
+    const std::string key = parameter->trimmedText();
+    if (key != "CfgVer" && key != "model") {
+      keys.push_back(key);
+    }
+  }
+  std::vector<std::string> fromTable;
+  for (const SettingRow& row : SettingRows()) {
+    SCOPED_TRACE(row.memoryType);
+    fromTable.emplace_back(row.configKey);
+    const std::string type = *Parameter(row.configKey).attribute("type");
+    const XmlElement* memtype = root().findByText("memtypes/memtype", row.memoryType);
+    ASSERT_NE(memtype, nullptr);
+    const std::string natural = *memtype->attribute("naturalType");
+    switch (row.kind) {
+      case SettingKind::Text:
+        EXPECT_TRUE(type == "prop_string" || type == "prop_hostName" || type == "prop_list");
+        EXPECT_EQ(natural, "byte");
+        break;
+      case SettingKind::Port:
+        EXPECT_EQ(type, "prop_integer");
+        EXPECT_EQ(natural, "unsignedShort");
+        break;
+      case SettingKind::Number:
+        EXPECT_EQ(type, "prop_integer");
+        EXPECT_EQ(natural, "unsignedInt");
+        break;
+      case SettingKind::Flag:
+        EXPECT_EQ(type, "prop_bool");
+        EXPECT_EQ(natural, "boolean");
+        break;
+    }
+  }
+  EXPECT_EQ(fromTable, keys);
+}
+
+TEST_F(DescriptionAndCode, EveryRuntimeParameterMemoryTypeIsASettingOrTheApply) {
+  std::vector<std::string> described;
+  for (const XmlElement* memtype : root().findAll("memtypes/memtype")) {
+    const std::string name = memtype->trimmedText();
+    if (name.rfind("SP_", 0) == 0 && name != "SP_Done") {
+      described.push_back(name);
+    }
+  }
+  std::vector<std::string> fromTable;
+  for (const SettingRow& row : SettingRows()) {
+    fromTable.emplace_back(row.memoryType);
+  }
+  EXPECT_EQ(described, fromTable);
 }
 }  // namespace

@@ -58,3 +58,15 @@ TEST(ScriptedChannel, QueuesReceivedTokensAsTheWorkerDoes) {
 }
 
 }  // namespace
+
+TEST(ScriptedChannel, ConnectRunsThePassesThatConnectTheChannel) {
+  ScriptedChannel channel(kConfig, true);
+  ScriptedSocket& socket = channel.Connect();
+  EXPECT_EQ(&socket, channel.Sockets().Last());
+  EXPECT_TRUE(channel.Protocol().isConnected());
+  EXPECT_EQ(socket.Connects().size(), 1U);
+  // From then on the socket keeps no records.
+  const std::size_t receives = socket.Receives().size();
+  channel.Protocol().Task();
+  EXPECT_EQ(socket.Receives().size(), receives);
+}
