@@ -27,6 +27,36 @@ void ReleaseMandatory(IInterfaceFactory* host, T*& service) {
   service = nullptr;
 }
 
+// Takes the four mandatory services in their fixed order. When one is
+// missing, gives back those already taken, in the order taken, and answers
+// the error text that names it; answers null when all four are held.
+const char* AcquireMandatory(IInterfaceFactory* host) {
+  piMultiTask = Acquire<IMultiTask2>(host, "IMultiTask2");
+  if (piMultiTask == nullptr) {
+    return "IMultiTask2 not created";
+  }
+  piSerialFactory = Acquire<ISerialFactory>(host, "ISerialFactory");
+  if (piSerialFactory == nullptr) {
+    ReleaseMandatory(host, piMultiTask);
+    return "ISerialFactory not created";
+  }
+  piSocketFactory = Acquire<ISocketFactory2>(host, "ISocketFactory");
+  if (piSocketFactory == nullptr) {
+    ReleaseMandatory(host, piMultiTask);
+    ReleaseMandatory(host, piSerialFactory);
+    return "ISocketFactory not created";
+  }
+  piCDSBuffer = Acquire<ICDSBuffer>(host, "ICDSBuffer");
+  if (piCDSBuffer == nullptr) {
+    ReleaseMandatory(host, piMultiTask);
+    ReleaseMandatory(host, piSerialFactory);
+    ReleaseMandatory(host, piSocketFactory);
+    // The text names the pointer, not the interface, as hosts expect it.
+    return "piCDSBuffer not created";
+  }
+  return nullptr;
+}
+
 }  // namespace
 
 ProtModule::~ProtModule() { Close(); }
@@ -51,31 +81,9 @@ int ProtModule::Init(IInterfaceFactory* host) {
     lastError = "IMultiTask2 not created";
     return 0;
   }
-  piMultiTask = Acquire<IMultiTask2>(host, "IMultiTask2");
-  if (piMultiTask == nullptr) {
-    lastError = "IMultiTask2 not created";
-    return 0;
-  }
-  piSerialFactory = Acquire<ISerialFactory>(host, "ISerialFactory");
-  if (piSerialFactory == nullptr) {
-    ReleaseMandatory(host, piMultiTask);
-    lastError = "ISerialFactory not created";
-    return 0;
-  }
-  piSocketFactory = Acquire<ISocketFactory2>(host, "ISocketFactory");
-  if (piSocketFactory == nullptr) {
-    ReleaseMandatory(host, piMultiTask);
-    ReleaseMandatory(host, piSerialFactory);
-    lastError = "ISocketFactory not created";
-    return 0;
-  }
-  piCDSBuffer = Acquire<ICDSBuffer>(host, "ICDSBuffer");
-  if (piCDSBuffer == nullptr) {
-    ReleaseMandatory(host, piMultiTask);
-    ReleaseMandatory(host, piSerialFactory);
-    ReleaseMandatory(host, piSocketFactory);
-    // The text names the pointer, not the interface, as hosts expect it.
-    lastError = "piCDSBuffer not created";
+  const char* const missing = AcquireMandatory(host);
+  if (missing != nullptr) {
+    lastError = missing;
     return 0;
   }
   piDiag = Acquire<IDiag>(host, "IDiag");
