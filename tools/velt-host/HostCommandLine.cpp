@@ -2,8 +2,9 @@
 
 #include <algorithm>
 
-#ifndef VELT_HOST_VERSION
-#define VELT_HOST_VERSION "unknown"
+// The build gives the project's version.
+#ifndef VELT_VERSION
+#error "VELT_VERSION must be defined"
 #endif
 
 namespace velthost {
@@ -20,7 +21,8 @@ const char* HostCommandLine::Usage() {
          "\n"
          "Options:\n"
          "  --plugin PATH        the plug-in to load (default: libvelt.so beside velt-host, "
-         "or in ../lib)\n"
+         "or in\n"
+         "                       " VELT_INSTALLED_PLUGIN_FOLDER " from velt-host's folder)\n"
          "  --storage PATH       the permanent-storage file (default: "
          "$XDG_STATE_HOME/velt/storage.ini,\n"
          "                       or ~/.local/state/velt/storage.ini)\n"
@@ -42,7 +44,7 @@ const char* HostCommandLine::Usage() {
          "2 for a bad command line.\n";
 }
 
-std::string HostCommandLine::Version() { return std::string("velt-host ") + VELT_HOST_VERSION; }
+std::string HostCommandLine::Version() { return std::string("velt-host ") + VELT_VERSION; }
 
 std::string HostCommandLine::DefaultName(std::size_t index) {
   return index == 0 ? std::string("VELT") : "VELT" + std::to_string(index + 1);

@@ -90,6 +90,6 @@ TEST(Program, HelpAndVersion) {
   EXPECT_EQ(result.err, "");
   EXPECT_EQ(result.status, std::optional<int>(0));
   result = HostProcess::Run({"--version"});
-  EXPECT_EQ(result.out, "velt-host 1.0.0\n");
+  EXPECT_EQ(result.out, "velt-host " VELT_VERSION "\n");
   EXPECT_EQ(result.status, std::optional<int>(0));
 }

@@ -103,7 +103,7 @@ TEST(PeerCommandLine, HelpAndVersionWinOverEverythingElse) {
   PeerCommandLine version;
   ASSERT_TRUE(version.Parse({"--version"}));
   EXPECT_EQ(version.GetAction(), PeerCommandLine::Action::kVersion);
-  EXPECT_EQ(PeerCommandLine::Version(), "velt-peer 1.0.0");
+  EXPECT_EQ(PeerCommandLine::Version(), "velt-peer " VELT_VERSION);
   EXPECT_EQ(std::string(PeerCommandLine::Usage()).rfind("Usage: velt-peer tcp|udp [options]\n", 0),
             0U);
 }

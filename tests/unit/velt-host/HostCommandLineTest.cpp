@@ -89,7 +89,7 @@ TEST(HostCommandLine, HelpAndVersionEndTheScan) {
   EXPECT_EQ(commandLine.Options().action, Action::kHelp);
   ASSERT_TRUE(commandLine.Parse({"--version"}));
   EXPECT_EQ(commandLine.Options().action, Action::kVersion);
-  EXPECT_EQ(HostCommandLine::Version(), "velt-host 1.0.0");
+  EXPECT_EQ(HostCommandLine::Version(), "velt-host " VELT_VERSION);
 }
 
 TEST(HostCommandLine, UnknownOptionAndCommandAreRefused) {
