@@ -63,5 +63,8 @@ endforeach()
 escape_line("${SEE_ALSO}" see_also)
 string(APPEND page ".fi\n.SH \"SEE ALSO\"\n.BR ${see_also} (1)\n")
 file(WRITE "${OUTPUT}" "${page}")
-file(ARCHIVE_CREATE OUTPUT "${OUTPUT}.gz" PATHS "${OUTPUT}" FORMAT raw
-  COMPRESSION GZip COMPRESSION_LEVEL 9)
+# gzip -n: no name or time stamp, so the same page gives the same bytes.
+execute_process(COMMAND gzip -9 -n -c "${OUTPUT}" OUTPUT_FILE "${OUTPUT}.gz" RESULT_VARIABLE rc)
+if(NOT rc EQUAL 0)
+  message(FATAL_ERROR "gzip failed on ${OUTPUT}")
+endif()

@@ -32,8 +32,13 @@ function(velt_package_documents component package)
   velt_release_date(date)
   set(VELT_PACKAGE_NAME ${package})
   configure_file(${PROJECT_SOURCE_DIR}/cmake/templates/changelog.in ${dir}/changelog @ONLY)
-  file(ARCHIVE_CREATE OUTPUT ${dir}/changelog.gz PATHS ${dir}/changelog
-    FORMAT raw COMPRESSION GZip COMPRESSION_LEVEL 9)
+  # gzip -n: no name or time stamp, so the same text gives the same bytes.
+  find_program(VELT_GZIP gzip REQUIRED)
+  execute_process(COMMAND ${VELT_GZIP} -9 -n -c ${dir}/changelog
+    OUTPUT_FILE ${dir}/changelog.gz RESULT_VARIABLE rc)
+  if(NOT rc EQUAL 0)
+    message(FATAL_ERROR "gzip failed on ${dir}/changelog")
+  endif()
   install(FILES ${dir}/copyright ${dir}/changelog.gz
     DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/${package} COMPONENT ${component})
 endfunction()

@@ -43,15 +43,22 @@ velt_deb_component(tools net "Velt Conduit console host and device simulator"
   "velt-host loads the Velt Conduit plug-in into the reference host and drives its
 channels from a console; velt-peer simulates a TCP or UDP device.")
 velt_deb_component(debug debug "debug symbols for velt-conduit"
-  "The debug information of the Velt Conduit plug-in, found by its build identifier.")
+  "The debug information of the Velt Conduit plug-in, found by the
+plug-in's build identifier.")
 
-# A package that holds a shared library declares it for dpkg-shlibdeps and
-# triggers ldconfig.
-set(CPACK_DEBIAN_LIBRARIES_PACKAGE_GENERATE_SHLIBS ON)
+# A package that holds a shared library declares it for dpkg-shlibdeps
+# (shlibs) and has ldconfig run through a trigger.
+set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY "=")
+file(WRITE ${PROJECT_BINARY_DIR}/package-control/triggers "activate-noawait ldconfig\n")
+set(CPACK_DEBIAN_LIBRARIES_PACKAGE_CONTROL_EXTRA ${PROJECT_BINARY_DIR}/package-control/triggers)
+set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
+# The static host library links zlib; the rest come from the component
+# dependencies below.
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "zlib1g-dev")
 set(CPACK_DEBIAN_DEBUG_PACKAGE_PRIORITY optional)
 
+set(CPACK_DEBIAN_ENABLE_COMPONENT_DEPENDS ON)
 if(VELT_BUILD_HOST)
   set(CPACK_COMPONENT_DEVELOPMENT_DEPENDS libraries)
 endif()
