@@ -7,6 +7,7 @@
 #include <netinet/in.h>
 #include <sys/socket.h>
 
+#include <cstring>
 #include <fstream>
 #include <functional>
 #include <limits>
@@ -30,8 +31,12 @@ IfAddrsList ReadInterfaces() {
   return IfAddrsList(list);
 }
 
+// The list's entries are sockaddr_in records behind sockaddr pointers, whose
+// alignment is smaller on some targets (2 on armhf): copied out, never cast.
 std::uint32_t HostOrder(const sockaddr* address) {
-  return ntohl(reinterpret_cast<const sockaddr_in*>(address)->sin_addr.s_addr);
+  sockaddr_in ipv4{};
+  std::memcpy(&ipv4, address, sizeof ipv4);
+  return ntohl(ipv4.sin_addr.s_addr);
 }
 
 bool IsIpv4(const ifaddrs& entry) {

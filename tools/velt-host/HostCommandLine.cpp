@@ -22,7 +22,8 @@ const char* HostCommandLine::Usage() {
          "Options:\n"
          "  --plugin PATH        the plug-in to load (default: libvelt.so beside velt-host, "
          "or in\n"
-         "                       " VELT_INSTALLED_PLUGIN_FOLDER " from velt-host's folder)\n"
+         "                       " VELT_INSTALLED_PLUGIN_FOLDER
+         " from velt-host's folder)\n"
          "  --storage PATH       the permanent-storage file (default: "
          "$XDG_STATE_HOME/velt/storage.ini,\n"
          "                       or ~/.local/state/velt/storage.ini)\n"
