@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Thin wrapper over the CMake presets.
 #   make test        licence and format checks, then every test suite (default,
 #                    asan and tsan builds) and the demo once, after the default

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Token framing: the stream framer fed a long stream one byte at a time, and
 // the datagram framer over full 1536-byte datagrams of many framed tokens.
 // Markers are given as hexadecimal text, as the configuration gives them.

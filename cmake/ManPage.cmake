@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Writes the manual page OUTPUT (and OUTPUT.gz) of PROGRAM, named NAME, from
 # what the program itself prints for --version and --help:
 #   NAME      NAME \- SUMMARY

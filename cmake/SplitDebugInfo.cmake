@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Splits a built ELF file INPUT into a stripped copy and its debug
 # information, in OUTPUT_DIR: NAME (stripped, with a debug link to the
 # other), NAME.debug, and NAME.build-id (the build identifier in hexadecimal,

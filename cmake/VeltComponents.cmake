@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # The install components of this build and the Debian package of each:
 #   plugin       velt-conduit         the plug-in, its licence and documentation
 #   libraries    libvelt-host1        the shared reference host library

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # GoogleTest for the test programs: Debian's installed libraries, or, for a
 # target without them (a cross build), compiled here from the source tree
 # that Debian's googletest package installs under /usr/src/googletest.

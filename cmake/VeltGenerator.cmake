@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # The description generator velt-xmlblock runs at build time, so it is always
 # a program for the build machine, never run through an emulator:
 # - VELT_XMLBLOCK_EXECUTABLE names one that is already built;

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # What an integrator builds against: the host's interface headers, the
 # reference host library and its headers, the CMake package Velt (targets
 # Velt::hostapi, Velt::host and Velt::host_static, with a version file) and

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # The manual pages of velt-host and velt-peer, made at build time from each
 # program's own --help and --version, so that they cannot drift from it.
 set(VELT_MAN_PAGES "")

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Debian packages with CPack, one per install component (VeltComponents.cmake),
 # built by `make package` into build/package/packages/. The dependencies
 # between the packages are exact versions; those on the system's libraries

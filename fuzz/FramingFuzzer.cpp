@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The token framers with fuzzed markers: the datagram framer over datagrams
 // of up to 1536 bytes and the stream framer fed byte by byte with silences.
 // Each is compared with a plain model of the framing rules, token for token.

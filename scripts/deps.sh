@@ -1,4 +1,7 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Makes sure the Debian packages a make target needs are present. As root it
 # installs what is missing with apt-get (after apt-get update); otherwise it
 # stops and prints the exact line to run, as root and through sudo.

@@ -1,4 +1,7 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Checks or adds the licence header at the top of every source file:
 #   // SPDX-License-Identifier: Apache-2.0
 #   // Copyright 2026 The Velt Conduit Authors

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Shared part of the toolchain files for Debian's cross compilers
 # (g++-<triplet>, from the Debian packages g++-aarch64-linux-gnu and
 # g++-arm-linux-gnueabihf). The including file sets VELT_CROSS_TRIPLET,

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The plug-in's entry point and its module-wide Factory object.
 #include "factory/GetInterfaceFactory.h"
 #include "factory/ModuleFactory.h"

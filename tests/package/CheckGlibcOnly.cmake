@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Fails unless the ELF file LIB needs the C library alone: no DT_NEEDED entry
 # but libc.so.6, libm.so.6 and the dynamic loader, and no version reference
 # but GLIBC_x.y (no GLIBCXX_, CXXABI_ or GCC_), none newer than GLIBC_CEILING.

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # The licence header script on a small tree of its own in WORK: --check must
 # name exactly the files without the header and fail, --fix must add it in
 # each file's comment syntax (below a #! line) and touch nothing else, and

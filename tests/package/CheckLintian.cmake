@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Runs lintian over every Debian package in DIR; any error fails. Warnings
 # are printed for the record.
 file(GLOB debs ${DIR}/*.deb)

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Fails unless the manual page PAGE renders without a groff warning and shows
 # every line of PROGRAM's --help, as printed, and its --version in the footer.
 find_program(GROFF groff REQUIRED)

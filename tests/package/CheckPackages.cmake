@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Reads back the Debian packages in DIR with dpkg-deb: each one's name,
 # version, dependencies (-I) and files (-c) must be the expected ones.
 # PREFIX, LIBDIR and PLUGINDIR give the install layout; STATIC says the

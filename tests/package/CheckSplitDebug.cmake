@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Fails unless LIB is stripped (no symbol table, no debug sections) and links
 # to DEBUG by name, and DEBUG holds the debug information when the build
 # made any. READELF is the target's readelf.

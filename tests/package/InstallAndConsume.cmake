@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Installs the build BUILD into the staging prefix WORK/stage, checks what
 # landed where, runs the installed velt-host, and builds and runs the outside
 # project CONSUMER against the staged install twice: found with

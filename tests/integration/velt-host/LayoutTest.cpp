@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Where velt-host looks for the plug-in and keeps its storage by default, and
 // how instances find their configuration and storage section.
 

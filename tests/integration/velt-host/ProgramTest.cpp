@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host's one-shot commands: xml, info, demo, --help and --version.
 
 #include <gtest/gtest.h>

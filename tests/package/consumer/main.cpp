@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Loads the installed plug-in into the installed reference host, creates one
 // channel and prints its protocol name and the first line of its information
 // text; the host must have every service back at the end.
