@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Token framing: the stream framer fed a long stream in receives of up to
 // 1536 bytes, as the channel's worker feeds it; the datagram framer over full
 // 1536-byte datagrams of many framed tokens; and the worker's whole pass

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // What idle and offline channels cost: CPU of one velt-host process (all its
 // threads) over a few seconds, its resident memory, and how soon a channel
 // reconnects once its absent peer comes back. Each scenario runs velt-host

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Token throughput of the plug-in on the reference host over loopback, with
 // 16-byte payloads (15 for the allocation figure):
 // - the worker alone filling the queue from a continuous TCP stream, framed

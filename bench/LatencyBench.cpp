@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // How long things take on the plug-in in the reference host over loopback:
 // - a token's way from the peer's send to the host's read of it, at 10 000
 //   tokens per second over TCP (percentiles over every token);

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // End to end on the reference host over loopback: the built plug-in receives
 // UDP datagrams and a TCP stream of framed tokens, which a host thread reads
 // (tokens_available, rx_token) and acknowledges (token_ack) as a panel does;

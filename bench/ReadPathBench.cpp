@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The read path without a device: the framework's Read (block read plus
 // conversion) of values up to 64 device bytes and its array-item access up to
 // 256 host bytes, the tag conversions up to 256 bytes, and the driver's own

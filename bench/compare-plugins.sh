@@ -1,4 +1,7 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Measures two builds of the plug-in with the same benchmark program, in
 # alternating rounds (one before, one after, and again), so that both see
 # the same machine; prints the median of every figure over the rounds.

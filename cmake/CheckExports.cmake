@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Fails unless the library LIB defines exactly one dynamic symbol:
 # GetInterfaceFactory, as an unmangled function.
 execute_process(COMMAND ${NM} -D --defined-only ${LIB}

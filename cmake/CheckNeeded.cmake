@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Fails when the ELF file LIB records a DT_NEEDED entry that matches the
 # regular expression FORBID, so that a library only the build tools use (zlib)
 # cannot leak into the plug-in. OBJDUMP is the objdump program to read it with.

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Applies the chosen sanitizer set to everything built from here on.
 # "fuzzer" instruments every object for libFuzzer's coverage feedback and
 # checks it with AddressSanitizer and UndefinedBehaviorSanitizer; only the

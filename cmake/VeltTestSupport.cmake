@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # The test doubles of tests/support (fake host services, memory protocol,
 # allocation counter, loopback helpers) for programs outside the test tree:
 # benchmarks and fuzz targets. They come with the tests; a build without the

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The configuration string: the driver's parameter reading (ParamManager)
 // and the parser's look-ups (CfgParser, readParam) and text utilities.
 //

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The driver console (Protocol_VELT::DoCommand, falling back to the base
 // console) with fuzzed command lines and output sizes. Bytes after the
 // output buffer's size must never be written.

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Tag value conversion (TagBase::Convert and DoConversion) with fuzzed types,
 // lengths, bit positions, conversion lists and values, and the bit packing
 // beneath it. Nothing may be written past a value, a failed conversion must

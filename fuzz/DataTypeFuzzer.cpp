@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The data-type text of tag addresses (ProtUtilsN::GetTAVUType) and the type
 // queries built on the type table.
 //

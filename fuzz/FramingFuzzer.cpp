@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The channel's push framers against the one-byte reference of the framing
 // steps (tests/support/FramingReference), with fuzzed markers (zero bytes
 // included): the stream receiver over the received bytes cut into receives

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host's command line (HostCommandLine::Parse).
 //
 // Input: the arguments after the program's name, separated by zero bytes

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host's console (Console::Run): dot commands, typed reads and writes,
 // and the lines it passes to an instance's own console, on two instances of
 // the driver over the test doubles of the host's services (no thread, no

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The dotted-quad address parser (IPParser, parseIpAddress) and its printer.
 //
 // Input: the address text up to the first zero byte; its first four bytes

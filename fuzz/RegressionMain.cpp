@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Runs a fuzz target over the files of a corpus, without the fuzzing engine:
 // the seed corpus and the saved reproducers become an ordinary test. Each
 // argument is a file or a folder of files (not searched recursively); a run

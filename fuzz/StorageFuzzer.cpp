@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The reference host's storage file (StorageFormat, HostPermanentStorage)
 // and the values a channel reads back from it when it starts.
 //

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Tag addresses of the token driver (Tag_VELT, made through
 // Protocol_VELT::CreateTagBase), and the reads and writes of the tags they
 // make.

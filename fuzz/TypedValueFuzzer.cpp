@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host's typed values (TypedValue::Parse and Format): the text of a
 // .write turned into a tag's bytes, and a tag's bytes printed by .read.
 //

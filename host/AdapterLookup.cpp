@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "AdapterLookup.h"
 
 #include <arpa/inet.h>
@@ -7,6 +10,7 @@
 #include <netinet/in.h>
 #include <sys/socket.h>
 
+#include <cstring>
 #include <fstream>
 #include <functional>
 #include <limits>
@@ -30,8 +34,12 @@ IfAddrsList ReadInterfaces() {
   return IfAddrsList(list);
 }
 
+// The list's entries are sockaddr_in records behind sockaddr pointers, whose
+// alignment is smaller on some targets (2 on armhf): copied out, never cast.
 std::uint32_t HostOrder(const sockaddr* address) {
-  return ntohl(reinterpret_cast<const sockaddr_in*>(address)->sin_addr.s_addr);
+  sockaddr_in ipv4{};
+  std::memcpy(&ipv4, address, sizeof ipv4);
+  return ntohl(ipv4.sin_addr.s_addr);
 }
 
 bool IsIpv4(const ifaddrs& entry) {

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The TCP side of HostSocket: connecting with pacing, the connection's link
 // state, buffered receiving and whole-frame sending.
 #include <poll.h>

@@ -1,4 +1,7 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Runs every benchmark program of a build with short repetitions and prints
 # the aggregates (mean, median, standard deviation).
 #   BENCH_MIN_TIME     seconds per repetition (default 0.2)

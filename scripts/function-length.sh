@@ -1,4 +1,7 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Measures the length of every function in src/ (lines from the opening to
 # the closing brace, blank lines and comments included, as clang-tidy's
 # readability-function-size counts them) and lists the longest. Fails when

@@ -1,4 +1,7 @@
 #!/bin/sh
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Runs each fuzz target of a fuzz build (cmake --preset fuzz) for a bounded
 # time. A target starts from its committed seed corpus (fuzz/corpus/<target>,
 # only read) and a working corpus under the build folder, which keeps what it

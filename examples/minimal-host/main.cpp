@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // minimal-host: the smallest complete host of the Velt Conduit plug-in.
 //
 // It does by hand, one step at a time, what a panel runtime does: load the

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The writer the storage kill test kills: the plug-in in the reference host
 // with one channel named VELT, applying rounds of 3 or 13 runtime parameters
 // (ApplyRound) with SP_Done as fast as it can, from round FIRST on, until it

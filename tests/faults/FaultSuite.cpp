@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The fault suite (make faults): each case drives the built plug-in, the
 // reference host, velt-host or velt-peer into a fault, prints its figures
 // and a verdict line, and the suite ends with status 1 when any case failed.

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The storage cases: applies reach the file whole under kill -9, and a full
 // disk or a read-only file is reported once per apply while the applied
 // values hold.

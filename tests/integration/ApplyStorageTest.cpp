@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // An apply through the plug-in reaches the storage file in one replacement,
 // however many values it carries, before the write of SP_Done returns.
 

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The plug-in's TCP channel against a peer that refuses connections, with the
 // reference host pacing the attempts: the driver keeps asking every 10 ms,
 // the host makes few real attempts, a returning peer is connected within the

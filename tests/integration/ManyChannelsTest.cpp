@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // 256 channels of the plug-in in one embedding program on the reference
 // host: 128 TCP channels whose peers are absent, 64 TCP channels connected to
 // a listener and 64 UDP channels. All start, connect (or keep trying), carry

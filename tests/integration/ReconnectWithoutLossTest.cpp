@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // A peer that accepts, sends three frames in separate writes and ends the
 // connection, a hundred times in a row, alternating an orderly close (FIN)
 // and a reset (RST): every frame of every connection must become a token.

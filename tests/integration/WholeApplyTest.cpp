@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The plug-in's applies reach the storage file whole or not at all: writers
 // applying rounds of 3 and of 13 runtime parameters are killed at random
 // instants, and after each kill the file must hold one whole round (or none),

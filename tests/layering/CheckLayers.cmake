@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Keeps the plug-in's layers pointing one way. Run as
 #   cmake -DROOT=<source tree> -P CheckLayers.cmake
 # It reads every #include of ROOT/src and ROOT/hostapi and fails, naming the

@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Proves that CheckLayers.cmake can fail: runs it on a tree whose includes
 # break the layers in every way it knows and compares its report, line for
 # line, with the expected one. Run as

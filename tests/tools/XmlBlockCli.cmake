@@ -1,3 +1,6 @@
+# SPDX-License-Identifier: Apache-2.0
+# Copyright 2026 The Velt Conduit Authors
+
 # Runs one case of velt-xmlblock's command-line checks: TOOL is the program,
 # CASE the case, WORK an empty directory for the case.
 file(REMOVE_RECURSE "${WORK}")

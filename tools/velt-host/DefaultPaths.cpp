@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "velt-host/DefaultPaths.h"
 
 #include <pwd.h>
@@ -45,7 +48,7 @@ std::string DefaultPaths::FolderOf(const std::string& path) {
 std::string DefaultPaths::PluginPath(const std::string& executableFolder) {
   const std::string folder = executableFolder.empty() ? std::string(".") : executableFolder;
   std::string beside = folder + "/" + kPluginFile;
-  std::string installed = folder + "/../lib/" + kPluginFile;
+  std::string installed = folder + "/" + kInstalledPluginFolder + "/" + kPluginFile;
   if (!Exists(beside) && Exists(installed)) {
     return installed;
   }

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #pragma once
 
 #include <string>
@@ -9,13 +12,16 @@ namespace velthost {
 class DefaultPaths {
  public:
   static constexpr const char* kPluginFile = "libvelt.so";
+  // The plug-in's install folder relative to the program's (the build
+  // tells, from the install layout).
+  static constexpr const char* kInstalledPluginFolder = VELT_INSTALLED_PLUGIN_FOLDER;
 
   // The folder of the running program (from /proc/self/exe); empty when it
   // cannot be told.
   static std::string ExecutableFolder();
-  // libvelt.so beside the program (as in the build tree), else in ../lib
-  // beside it (as installed); the first when neither exists, so that the
-  // error names it.
+  // libvelt.so beside the program (as in the build tree), else in the
+  // installed plug-in folder (kInstalledPluginFolder from the program's
+  // folder); the first when neither exists, so that the error names it.
   static std::string PluginPath(const std::string& executableFolder);
   // $XDG_STATE_HOME/velt/storage.ini when stateHome is an absolute path,
   // else HOME/.local/state/velt/storage.ini; empty when neither is usable.

@@ -1,10 +1,14 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "velt-host/HostCommandLine.h"
 
 #include <string>
 #include <unordered_set>
 
-#ifndef VELT_HOST_VERSION
-#define VELT_HOST_VERSION "unknown"
+// The build gives the project's version.
+#ifndef VELT_VERSION
+#error "VELT_VERSION must be defined"
 #endif
 
 namespace velthost {
@@ -21,7 +25,9 @@ const char* HostCommandLine::Usage() {
          "\n"
          "Options:\n"
          "  --plugin PATH        the plug-in to load (default: libvelt.so beside velt-host, "
-         "or in ../lib)\n"
+         "or in\n"
+         "                       " VELT_INSTALLED_PLUGIN_FOLDER
+         " from velt-host's folder)\n"
          "  --storage PATH       the permanent-storage file (default: "
          "$XDG_STATE_HOME/velt/storage.ini,\n"
          "                       or ~/.local/state/velt/storage.ini)\n"
@@ -47,7 +53,7 @@ const char* HostCommandLine::Usage() {
          "2 for a bad command line.\n";
 }
 
-std::string HostCommandLine::Version() { return std::string("velt-host ") + VELT_HOST_VERSION; }
+std::string HostCommandLine::Version() { return std::string("velt-host ") + VELT_VERSION; }
 
 std::string HostCommandLine::DefaultName(std::size_t index) {
   return index == 0 ? std::string("VELT") : "VELT" + std::to_string(index + 1);

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host: loads the Velt Conduit plug-in into the reference host and
 // drives its instances from a console, prints its description or
 // information text, or runs the demo.

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "velt-peer/PeerCommandLine.h"
 
 #include <sys/socket.h>
@@ -10,8 +13,9 @@
 #include "velt-peer/HexText.h"
 #include "velt-peer/NumberText.h"
 
-#ifndef VELT_PEER_VERSION
-#define VELT_PEER_VERSION "0.0.0"
+// The build gives the project's version.
+#ifndef VELT_VERSION
+#error "VELT_VERSION must be defined"
 #endif
 
 namespace veltpeer {
@@ -104,7 +108,7 @@ Errors go to stderr. Exit status: 0 after SIGINT, SIGTERM or a run limit;
 
 const char* PeerCommandLine::Usage() { return kUsage; }
 
-std::string PeerCommandLine::Version() { return std::string("velt-peer ") + VELT_PEER_VERSION; }
+std::string PeerCommandLine::Version() { return std::string("velt-peer ") + VELT_VERSION; }
 
 bool PeerCommandLine::Parse(const std::vector<std::string>& arguments) {
   for (const std::string& argument : arguments) {

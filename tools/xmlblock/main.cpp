@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-xmlblock INPUT.xml OUTPUT.cpp
 //
 // Compresses the driver's XML description and writes the C++ source of the

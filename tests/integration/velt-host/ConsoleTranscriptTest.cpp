@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The instance's own console through velt-host's scripted standard input:
 // every reply is printed as it stands, with a line feed added where it has
 // none.

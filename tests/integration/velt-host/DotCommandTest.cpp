@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host's own commands: typed .read and .write, .list, .use and .watch,
 // through scripted standard input and through -c.
 

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Start-up failures end velt-host with status 1 and one line on standard
 // error; a bad command line ends it with status 2 before anything is loaded.
 

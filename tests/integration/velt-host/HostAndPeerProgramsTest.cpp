@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host and velt-peer as two programs talking over loopback, as an
 // operator runs them: the peer picks a free port and announces it on its
 // first line.

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Where velt-host looks for the plug-in and keeps its storage by default, and
 // how instances find their configuration and storage section.
 
@@ -19,18 +22,22 @@ const std::string kConfig =
 
 }  // namespace
 
-TEST(Layout, InstalledProgramFindsThePluginInLibBesideBin) {
+// Installed, the plug-in lives in its own folder under the library folder
+// (lib/velt, or lib/<triplet>/velt under /usr), which the build tells as a
+// path relative to the program's folder.
+TEST(Layout, InstalledProgramFindsThePluginInThePluginFolder) {
   ScratchFolder scratch;
   ASSERT_EQ(::mkdir(scratch.File("bin").c_str(), 0700), 0);
-  ASSERT_EQ(::mkdir(scratch.File("lib").c_str(), 0700), 0);
+  const std::string pluginFolder = scratch.File("bin/" VELT_INSTALLED_PLUGIN_FOLDER);
+  ASSERT_TRUE(std::filesystem::create_directories(pluginFolder));
   const std::string program = scratch.File("bin/velt-host");
   std::filesystem::copy_file(VELT_HOST_PROGRAM, program);
-  std::filesystem::copy_file(VELT_PLUGIN_PATH, scratch.File("lib/libvelt.so"));
+  std::filesystem::copy_file(VELT_PLUGIN_PATH, pluginFolder + "/libvelt.so");
   const std::string command = program + " info > " + scratch.File("out.txt") + " 2>&1";
   ASSERT_EQ(std::system(command.c_str()), 0) << scratch.Read("out.txt");
   EXPECT_EQ(scratch.Read("out.txt").rfind("Protocol: VELT (472) v.112\n", 0), 0U);
 
-  std::filesystem::remove(scratch.File("lib/libvelt.so"));
+  std::filesystem::remove(pluginFolder + "/libvelt.so");
   EXPECT_NE(std::system(command.c_str()), 0);
   EXPECT_EQ(scratch.Read("out.txt"), "velt-host: cannot load plug-in " + scratch.File("bin") +
                                          "/libvelt.so: " + scratch.File("bin") +

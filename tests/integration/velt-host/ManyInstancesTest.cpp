@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host with hundreds of instances in one process: the limit of open
 // files is raised for them or the start is refused with a clear message, and
 // 256 instances start, connect, list and stop.

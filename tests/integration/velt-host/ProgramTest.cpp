@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host's one-shot commands: xml, info, demo, --help and --version.
 
 #include <gtest/gtest.h>
@@ -90,6 +93,6 @@ TEST(Program, HelpAndVersion) {
   EXPECT_EQ(result.err, "");
   EXPECT_EQ(result.status, std::optional<int>(0));
   result = HostProcess::Run({"--version"});
-  EXPECT_EQ(result.out, "velt-host 1.0.0\n");
+  EXPECT_EQ(result.out, "velt-host " VELT_VERSION "\n");
   EXPECT_EQ(result.status, std::optional<int>(0));
 }

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // A console session ends cleanly on SIGTERM, SIGINT, .quit and the end of its
 // input: the instances are stopped (their connections close) and the exit
 // status tells whether every command succeeded.

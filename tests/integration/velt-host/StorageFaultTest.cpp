@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // velt-host and its storage file: a write that fails is reported on standard
 // error once per apply and fails the run, while the applied values stay in
 // force; stored values that break their ranges are reported at start and

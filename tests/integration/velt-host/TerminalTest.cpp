@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The interactive console in a pseudo-terminal: banner, prompt, line
 // editing with history, .watch ended by a key, and the ways out. Keys are
 // typed once the prompt shows, as a person types them.

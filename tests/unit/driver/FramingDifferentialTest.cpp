@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The channel's push framers against the one-byte reference of the framing
 // steps, over random received data: random bytes (mostly from a few values,
 // so markers occur often, and sometimes long runs that reach the dropped

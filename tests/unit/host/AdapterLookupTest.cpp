@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include <arpa/inet.h>
 #include <gtest/gtest.h>
 #include <ifaddrs.h>
@@ -7,6 +10,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <cstring>
 #include <fstream>
 #include <map>
 #include <set>
@@ -39,6 +43,14 @@ Answer AskFactory(unsigned ip) {
   return answer;
 }
 
+// An IPv4 address of the system's list in host order; copied out of the
+// entry, whose sockaddr pointer is less aligned than sockaddr_in on armhf.
+unsigned HostOrder(const sockaddr* address) {
+  sockaddr_in ipv4{};
+  std::memcpy(&ipv4, address, sizeof ipv4);
+  return ntohl(ipv4.sin_addr.s_addr);
+}
+
 // Every IPv4 address of the machine with its mask, from the system's list.
 std::map<unsigned, unsigned> LocalAddresses() {
   std::map<unsigned, unsigned> addresses;
@@ -48,9 +60,7 @@ std::map<unsigned, unsigned> LocalAddresses() {
   }
   for (const ifaddrs* entry = list; entry != nullptr; entry = entry->ifa_next) {
     if (entry->ifa_addr != nullptr && entry->ifa_addr->sa_family == AF_INET) {
-      const auto* address = reinterpret_cast<const sockaddr_in*>(entry->ifa_addr);
-      const auto* mask = reinterpret_cast<const sockaddr_in*>(entry->ifa_netmask);
-      addresses.emplace(ntohl(address->sin_addr.s_addr), ntohl(mask->sin_addr.s_addr));
+      addresses.emplace(HostOrder(entry->ifa_addr), HostOrder(entry->ifa_netmask));
     }
   }
   ::freeifaddrs(list);
@@ -90,8 +100,7 @@ std::set<unsigned> AddressesOf(const std::string& interfaceName) {
   for (const ifaddrs* entry = list; entry != nullptr; entry = entry->ifa_next) {
     if (entry->ifa_addr != nullptr && entry->ifa_addr->sa_family == AF_INET &&
         interfaceName == entry->ifa_name) {
-      addresses.insert(
-          ntohl(reinterpret_cast<const sockaddr_in*>(entry->ifa_addr)->sin_addr.s_addr));
+      addresses.insert(HostOrder(entry->ifa_addr));
     }
   }
   ::freeifaddrs(list);

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // How the permanent storage finds the values of one apply (those set while a
 // thread holds host mutexes), writes them in one replacement, and reports a
 // write that fails.

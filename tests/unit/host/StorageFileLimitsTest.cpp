@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // What the permanent storage accepts as its file: a regular file of at most
 // 16 MiB, read without waiting on a FIFO or reading a device; and the
 // temporary files of killed writes, removed at the next load.

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // The permanent storage on a real full file system and on a read-only one:
 // a 64 KiB tmpfs mounted in a mount namespace of a child process, so that
 // nothing outside the test sees it. Where the test may not mount (no

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include <gtest/gtest.h>
 
 #include "IInterfaceFactory.h"
@@ -16,6 +19,42 @@
 // binary interface: a reordering must fail here, never on a panel.
 // Slots 0 and 1 of an interface with a virtual destructor are the complete and
 // deleting destructors.
+
+namespace {
+
+// Two classes with the same functions declared in opposite orders, one of
+// them non-virtual, and a derived class that appends one.
+struct Forward {
+  virtual ~Forward() = default;
+  virtual int First() { return 1; }
+  virtual int Second() { return 2; }
+  int Plain() { return 0; }
+};
+
+struct Reordered {
+  virtual ~Reordered() = default;
+  virtual int Second() { return 2; }
+  virtual int First() { return 1; }
+};
+
+struct Appended : Forward {
+  virtual int Third() { return 3; }
+};
+
+}  // namespace
+
+// The decoding itself, on the ABI of this build (Itanium or ARM): a swap of
+// two declarations swaps their slots, a non-virtual function has none, and a
+// derived class's own function follows the inherited ones.
+TEST(SlotOrder, DecodingTellsAReorderingOnThisAbi) {
+  EXPECT_EQ(VtableSlot(&Forward::First), 2);
+  EXPECT_EQ(VtableSlot(&Forward::Second), 3);
+  EXPECT_EQ(VtableSlot(&Reordered::Second), 2);
+  EXPECT_EQ(VtableSlot(&Reordered::First), 3);
+  EXPECT_EQ(VtableSlot(&Forward::Plain), -1);
+  EXPECT_EQ(VtableSlot(&Appended::Third), 4);
+  EXPECT_EQ(VtableSlot(&Appended::Second), 3);
+}
 
 TEST(SlotOrder, InterfaceFactoryHasNoDestructorSlots) {
   EXPECT_EQ(VtableSlot(&IInterfaceFactory::CreateInterface), 0);

@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "velt-peer/PeerCommandLine.h"
 
 #include <gtest/gtest.h>
@@ -103,7 +106,7 @@ TEST(PeerCommandLine, HelpAndVersionWinOverEverythingElse) {
   PeerCommandLine version;
   ASSERT_TRUE(version.Parse({"--version"}));
   EXPECT_EQ(version.GetAction(), PeerCommandLine::Action::kVersion);
-  EXPECT_EQ(PeerCommandLine::Version(), "velt-peer 1.0.0");
+  EXPECT_EQ(PeerCommandLine::Version(), "velt-peer " VELT_VERSION);
   EXPECT_EQ(std::string(PeerCommandLine::Usage()).rfind("Usage: velt-peer tcp|udp [options]\n", 0),
             0U);
 }

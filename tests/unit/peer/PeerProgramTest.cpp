@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <sys/socket.h>
@@ -146,6 +149,6 @@ TEST(PeerProgram, HelpAndVersion) {
             std::optional<std::string>("Usage: velt-peer tcp|udp [options]"));
   EXPECT_EQ(help.Wait(kTimeout), std::optional<int>(0));
   PeerProcess version({"--version"});
-  EXPECT_EQ(version.ReadLine(kTimeout), std::optional<std::string>("velt-peer 1.0.0"));
+  EXPECT_EQ(version.ReadLine(kTimeout), std::optional<std::string>("velt-peer " VELT_VERSION));
   EXPECT_EQ(version.Wait(kTimeout), std::optional<int>(0));
 }

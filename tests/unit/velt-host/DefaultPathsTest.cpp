@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "velt-host/DefaultPaths.h"
 
 #include <gtest/gtest.h>
@@ -46,11 +49,13 @@ TEST(DefaultPaths, PluginBesideTheProgramComesFirst) {
   const TempFolder root("velt-paths");
   const std::string bin = root.File("bin");
   ASSERT_EQ(::mkdir(bin.c_str(), 0700), 0);
-  ASSERT_EQ(::mkdir(root.File("lib").c_str(), 0700), 0);
+  const std::string installed = bin + "/" + DefaultPaths::kInstalledPluginFolder;
+  std::string error;
+  ASSERT_TRUE(DefaultPaths::MakeFolders(installed, error)) << error;
   // Neither exists: the path beside the program, so that the error names it.
   EXPECT_EQ(DefaultPaths::PluginPath(bin), bin + "/libvelt.so");
-  Touch(root.File("lib/libvelt.so"));
-  EXPECT_EQ(DefaultPaths::PluginPath(bin), bin + "/../lib/libvelt.so");
+  Touch(installed + "/libvelt.so");
+  EXPECT_EQ(DefaultPaths::PluginPath(bin), installed + "/libvelt.so");
   Touch(bin + "/libvelt.so");
   EXPECT_EQ(DefaultPaths::PluginPath(bin), bin + "/libvelt.so");
 }

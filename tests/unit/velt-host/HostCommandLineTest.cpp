@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 #include "velt-host/HostCommandLine.h"
 
 #include <gtest/gtest.h>
@@ -91,7 +94,7 @@ TEST(HostCommandLine, HelpAndVersionEndTheScan) {
   EXPECT_EQ(commandLine.Options().action, Action::kHelp);
   ASSERT_TRUE(commandLine.Parse({"--version"}));
   EXPECT_EQ(commandLine.Options().action, Action::kVersion);
-  EXPECT_EQ(HostCommandLine::Version(), "velt-host 1.0.0");
+  EXPECT_EQ(HostCommandLine::Version(), "velt-host " VELT_VERSION);
 }
 
 TEST(HostCommandLine, UnknownOptionAndCommandAreRefused) {

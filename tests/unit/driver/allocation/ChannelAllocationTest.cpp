@@ -1,3 +1,6 @@
+// SPDX-License-Identifier: Apache-2.0
+// Copyright 2026 The Velt Conduit Authors
+
 // Heap allocations of the worker per received token, counted on the
 // worker's thread (here the test's own, which runs the passes). Once the
 // token queue has grown to its bound, a token of up to 15 bytes costs no
