@@ -14,8 +14,17 @@
 // none but at the end); a byte for the size of each receive (its value
 // plus 1); a byte for the receive buffer (0: the channel's 1536 bytes, else
 // that many); a byte whose bits, in turn, say whether a pass ends early when
-// it is about to receive; then the received bytes.
+// it is about to receive; a byte for the token queue (its low four bits plus
+// 1 the bound, its top bit hex tokens); then the received bytes.
+//
+// Beside the agreement with the reference, the target checks what holds of
+// every token whatever the reference says: a stream token is shorter than
+// the dropped length, a datagram token is never empty, each token stands in
+// the received bytes between the markers, and a queue fed the tokens never
+// holds more than its bound, the newest ones, as upper-case hex of even
+// length when hex tokens are on.
 
+#include <algorithm>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -25,6 +34,7 @@
 #include "FuzzInput.h"
 #include "Require.h"
 #include "driver/StreamFraming.h"
+#include "driver/TokenQueue.h"
 
 namespace {
 
@@ -34,13 +44,65 @@ using framing_reference::Tokens;
 
 constexpr std::size_t kDatagramSize = 1536;
 
-void CheckDatagrams(const std::string& bytes, const std::string& prefix,
+// Whether the token stands in bytes between the markers. A token closed by
+// the gap or by the next prefix has no suffix after it.
+bool BetweenMarkers(const std::string& bytes, const std::string& prefix, const std::string& token,
                     const std::string& suffix) {
+  return bytes.find(prefix + token + suffix) != std::string::npos;
+}
+
+// A marker as datagram framing matches it: a C text, cut at a zero byte.
+std::string AsCText(const std::string& marker) { return marker.substr(0, marker.find('\0')); }
+
+Tokens CheckDatagrams(const std::string& bytes, const std::string& prefix,
+                      const std::string& suffix) {
+  Tokens all;
   for (std::size_t start = 0; start < bytes.size(); start += kDatagramSize) {
     const std::string datagram = bytes.substr(start, kDatagramSize);
-    Require(framing_reference::FramerDatagram(datagram, prefix, suffix) ==
-                framing_reference::DatagramTokens(datagram, prefix, suffix),
+    const Tokens tokens = framing_reference::FramerDatagram(datagram, prefix, suffix);
+    Require(tokens == framing_reference::DatagramTokens(datagram, prefix, suffix),
             "the datagram framer cuts the tokens of the one-byte reference");
+    for (const std::string& token : tokens) {
+      Require(!token.empty(), "no datagram token is empty");
+      Require(BetweenMarkers(datagram, AsCText(prefix), token, AsCText(suffix)),
+              "a datagram token stands in its datagram between the markers");
+      all.push_back(token);
+    }
+  }
+  return all;
+}
+
+std::string UpperHex(const std::string& bytes) {
+  static const char kDigits[] = "0123456789ABCDEF";
+  std::string text;
+  for (const char byte : bytes) {
+    const auto value = static_cast<unsigned char>(byte);
+    text.push_back(kDigits[value >> 4U]);
+    text.push_back(kDigits[value & 0x0FU]);
+  }
+  return text;
+}
+
+// Queues the tokens with the fuzzed bound and hex setting: the queue keeps
+// the newest ones, never more than the bound, in their final form.
+void CheckQueue(const Tokens& tokens, std::uint8_t queueByte) {
+  const int bound = (queueByte & 0x0F) + 1;
+  const bool hex = (queueByte & 0x80U) != 0;
+  TokenQueue queue(nullptr);
+  TokenQueue::Guard held(queue);
+  held.setRules(bound, hex);
+  for (const std::string& token : tokens) {
+    held.addToken(token);
+    Require(held.Size() <= static_cast<std::size_t>(bound), "the queue keeps to its bound");
+  }
+  const std::size_t kept = held.Size();
+  Require(kept == std::min(tokens.size(), static_cast<std::size_t>(bound)),
+          "the queue holds as many tokens as its bound allows");
+  for (std::size_t i = tokens.size() - kept; i < tokens.size(); ++i) {
+    const std::string& front = held.Front();
+    Require(front == (hex ? UpperHex(tokens[i]) : tokens[i]),
+            "the queue keeps the newest tokens, as upper-case hex of even length with hex on");
+    held.PopFront();
   }
 }
 
@@ -84,8 +146,8 @@ Layout ReadLayout(FuzzInput& input) {
   return layout;
 }
 
-void CheckStream(const std::string& bytes, const std::string& prefix, const std::string& suffix,
-                 const Layout& layout) {
+Tokens CheckStream(const std::string& bytes, const std::string& prefix, const std::string& suffix,
+                   const Layout& layout) {
   const Stream stream = Pieces(bytes, layout.pieceSize, layout.silenceEvery);
   std::vector<bool> interrupts(4 * stream.size() + 4);
   for (std::size_t i = 0; i < interrupts.size(); ++i) {
@@ -96,12 +158,18 @@ void CheckStream(const std::string& bytes, const std::string& prefix, const std:
       framing_reference::ReceiverPasses(stream, prefix, suffix, layout.buffer, interrupts);
   Require(actual == expected,
           "the stream receiver cuts the tokens of the one-byte reference, pass by pass");
+  Tokens all;
   for (const Tokens& pass : actual) {
     for (const std::string& token : pass) {
       Require(token.size() < StreamFraming::kDroppedFrameLength,
               "no stream token reaches the dropped length");
+      Require(BetweenMarkers(bytes, prefix, token, "") &&
+                  (suffix.empty() || BetweenMarkers(bytes, prefix, token, suffix)),
+              "a stream token stands in the received bytes after the prefix, before the suffix");
+      all.push_back(token);
     }
   }
+  return all;
 }
 
 }  // namespace
@@ -111,8 +179,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const std::string prefix = input.ShortText(6);
   const std::string suffix = input.ShortText(6);
   const Layout layout = ReadLayout(input);
+  const std::uint8_t queueByte = input.Byte();
   const std::string bytes = input.Rest();
-  CheckDatagrams(bytes, prefix, suffix);
-  CheckStream(bytes, prefix, suffix, layout);
+  CheckQueue(CheckDatagrams(bytes, prefix, suffix), queueByte);
+  CheckQueue(CheckStream(bytes, prefix, suffix, layout), queueByte);
   return 0;
 }
