@@ -3,6 +3,8 @@
 
 #include "ScriptedSocket.h"
 
+#include "FakeMultiTask.h"
+
 #include <algorithm>
 #include <cstring>
 
@@ -98,6 +100,7 @@ int ScriptedSocket::Send(const unsigned char* data, int length) {
   const std::lock_guard<std::mutex> guard(lock_);
   if (keepRecords_) {
     sends_.emplace_back(reinterpret_cast<const char*>(data), static_cast<std::size_t>(length));
+    locksHeldAtSends_.push_back(FakeMultiTask::MutexesHeldHere());
   }
   return length;
 }
@@ -168,6 +171,11 @@ std::vector<ScriptedSocket::ConnectCall> ScriptedSocket::Connects() const {
 std::vector<std::string> ScriptedSocket::Sends() const {
   const std::lock_guard<std::mutex> guard(lock_);
   return sends_;
+}
+
+std::vector<int> ScriptedSocket::LocksHeldAtSends() const {
+  const std::lock_guard<std::mutex> guard(lock_);
+  return locksHeldAtSends_;
 }
 
 std::vector<ScriptedSocket::ReceiveCall> ScriptedSocket::Receives() const {

@@ -62,6 +62,9 @@ class ScriptedSocket final : public ISocket {
   int Tcp() const { return tcp_; }
   std::vector<ConnectCall> Connects() const;
   std::vector<std::string> Sends() const;
+  // For each send, how many of FakeMultiTask's mutexes the sending thread
+  // held while it sent.
+  std::vector<int> LocksHeldAtSends() const;
   std::vector<ReceiveCall> Receives() const;
   std::vector<unsigned int> AdapterQueries() const;
 
@@ -90,6 +93,7 @@ class ScriptedSocket final : public ISocket {
   unsigned int adapterMask_ = 0;
   std::vector<ConnectCall> connects_;
   std::vector<std::string> sends_;
+  std::vector<int> locksHeldAtSends_;
   std::vector<ReceiveCall> receives_;
   std::vector<unsigned int> adapterQueries_;
 };
