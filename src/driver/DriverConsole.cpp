@@ -118,7 +118,7 @@ bool DriverConsole::Put(const std::string& command, char* output, int outputSize
   if (text.empty()) {
     return Failure(output, outputSize, "ERROR: string to send is missing");
   }
-  if (!protocol_.getAccess().SendToken(text)) {
+  if (!protocol_.getAccess().SendToken(text, MemoryAccess::SendLock::Released)) {
     return Failure(output, outputSize, std::string("ERROR: ") + kTokenNotHex.text);
   }
   return Success(output, outputSize, "OK");

@@ -4,6 +4,7 @@
 #include "driver/MemoryAccess.h"
 
 #include <cstdint>
+#include <optional>
 
 #include "driver/ChannelMemory.h"
 #include "driver/DriverErrors.h"
@@ -117,7 +118,7 @@ bool MemoryAccess::WriteChannel(const Tag_VELT& tag, const unsigned char* data, 
       return true;
     }
     case ChannelMemory::TxToken:
-      return SendToken(GetText(data, room)) || Fail(protocol_, kTokenNotHex);
+      return SendToken(GetText(data, room), SendLock::Held) || Fail(protocol_, kTokenNotHex);
     default:
       return Fail(protocol_, kIllegalWrite);
   }
@@ -145,21 +146,29 @@ bool MemoryAccess::StageSetting(const Tag_VELT& tag, const SettingRow& row,
   return Fail(protocol_, kIllegalWrite);
 }
 
-bool MemoryAccess::SendToken(const std::string& text) {
+bool MemoryAccess::FrameToken(const TokenQueue::Guard& held, const std::string& text,
+                              std::string& frame) const {
+  const ChannelSettings& working = requests_.Settings(held);
+  const bool hex = working.flag(Setting::HexTokens);
+  if (hex && !isHex(text.c_str())) {
+    return false;
+  }
+  // Prefix and suffix are always held as hexadecimal text.
+  frame = fromHex(working.text(Setting::TxPrefix));
+  frame += hex ? fromHex(text) : text;
+  frame += fromHex(working.text(Setting::TxSuffix));
+  return true;
+}
+
+bool MemoryAccess::SendToken(const std::string& text, SendLock lock) {
+  std::optional<TokenQueue::Guard> held;
+  held.emplace(tokenQueue_);
   std::string frame;
-  {
-    // The transmit settings are read under queueLock; the send itself, which
-    // may wait for the peer, is made after it is released.
-    const TokenQueue::Guard held(tokenQueue_);
-    const ChannelSettings& working = requests_.Settings(held);
-    const bool hex = working.flag(Setting::HexTokens);
-    if (hex && !isHex(text.c_str())) {
-      return false;
-    }
-    // Prefix and suffix are always held as hexadecimal text.
-    frame = fromHex(working.text(Setting::TxPrefix));
-    frame += hex ? fromHex(text) : text;
-    frame += fromHex(working.text(Setting::TxSuffix));
+  if (!FrameToken(*held, text, frame)) {
+    return false;
+  }
+  if (lock == SendLock::Released) {
+    held.reset();
   }
   channel_.Send(frame);
   return true;

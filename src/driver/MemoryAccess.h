@@ -3,6 +3,7 @@
 
 #pragma once
 
+#include <cstdint>
 #include <string>
 
 #include "driver/ChannelRequests.h"
@@ -38,14 +39,20 @@ class MemoryAccess {
   bool Read(const Tag_VELT& tag, unsigned char* data, int room);
   // Gives the memory type the value at data.
   bool Write(const Tag_VELT& tag, const unsigned char* data, int room);
+  // Whether a send is made under queueLock: a tx_token write sends under it,
+  // as every write to the channel is made; the console's put sends after it
+  // is released, since the console takes the lock for the queue alone.
+  enum class SendLock : std::uint8_t { Held, Released };
   // Frames text with the transmit markers (and decodes it first when hex
   // tokens are on) and sends it in one send on the current socket; false,
-  // with nothing sent, when hex tokens are on and the text is not hex.
-  bool SendToken(const std::string& text);
+  // with nothing sent, when hex tokens are on and the text is not hex. The
+  // frame is always made under queueLock.
+  bool SendToken(const std::string& text, SendLock lock);
   // A copy of the working settings.
   ChannelSettings Working();
 
  private:
+  bool FrameToken(const TokenQueue::Guard& held, const std::string& text, std::string& frame) const;
   bool ReadChannel(const Tag_VELT& tag, unsigned char* data, int room);
   bool ReadSetting(const Tag_VELT& tag, const SettingRow& row, unsigned char* data, int room);
   bool WriteChannel(const Tag_VELT& tag, const unsigned char* data, int room);
