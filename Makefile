@@ -66,7 +66,7 @@ run-demo: suite-default
 	$(DEMO)
 
 bench: build
-	sh scripts/bench.sh build/default/bench
+	sh scripts/bench.sh build/default/bin
 
 FUZZ_SECONDS ?= 20
 fuzz: deps
