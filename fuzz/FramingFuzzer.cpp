@@ -27,6 +27,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "FramingDifferential.h"
@@ -73,7 +74,7 @@ Tokens CheckDatagrams(const std::string& bytes, const std::string& prefix,
 }
 
 std::string UpperHex(const std::string& bytes) {
-  static const char kDigits[] = "0123456789ABCDEF";
+  constexpr std::string_view kDigits = "0123456789ABCDEF";
   std::string text;
   for (const char byte : bytes) {
     const auto value = static_cast<unsigned char>(byte);
